@@ -115,8 +115,13 @@ bool PostgresServer::start(const std::vector<std::string>& settings) {
   const bool was_running = status().has_value();
   if (!was_running) {
     make_folder(socket_folder_);
-    std::vector<std::string> arguments{find_server_programs() / "postgres", "-D", data_, "-k",
-                                       socket_folder_, "-c", "listen_addresses="};
+    std::vector<std::string> arguments{find_server_programs() / "postgres",
+                                       "-D",
+                                       data_,
+                                       "-k",
+                                       socket_folder_,
+                                       "-c",
+                                       "listen_addresses="};
     for (const auto& setting : settings) {
       arguments.emplace_back("-c");
       arguments.push_back(setting);

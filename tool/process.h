@@ -24,8 +24,8 @@ struct Account {
 std::optional<Account> find_account(const std::string& name);
 
 /// Starts `arguments[0]` in a session of its own, standard input from nowhere and both outputs
-/// appended to `log` (owned by whom the program runs as), as `account` when there is one. Returns the
-/// process id. Throws std::system_error.
+/// appended to `log` (owned by whom the program runs as), as `account` when there is one. Returns
+/// the process id. Throws std::system_error.
 pid_t start_program(const std::vector<std::string>& arguments, const std::string& log,
                     const std::optional<Account>& account);
 

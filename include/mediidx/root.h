@@ -15,7 +15,7 @@ extern "C" {
 /// marker file, service links, pid files, programs) below this directory. Null or empty, the
 /// default, means the real paths. Paths of callers, stored paths, statements and messages are the
 /// same either way. A root that does not fit 4,095 bytes is refused with -1; otherwise 0.
-MEDIIDX_EXPORT int TAVOMediaIndexRootSet(const char *root);
+MEDIIDX_EXPORT int TAVOMediaIndexRootSet(const char* root);
 
 #ifdef __cplusplus
 }

@@ -24,16 +24,16 @@ enum {
   MEDIA_TABLE_MUSIC = 0,
   MEDIA_TABLE_VIDEO = 1,
   MEDIA_TABLE_PHOTO = 2,
-  MEDIA_TABLE_PLAYLIST = 3,      ///< Cue sheets are playlists too.
+  MEDIA_TABLE_PLAYLIST = 3,  ///< Cue sheets are playlists too.
   MEDIA_TABLE_DIRECTORY = 4,
-  MEDIA_TABLE_VIDEO_CONVERT = 5, ///< Transcoded copies of videos.
-  MEDIA_TABLE_FOLDER = 6         ///< A whole folder tree; accepted by deletes only.
+  MEDIA_TABLE_VIDEO_CONVERT = 5,  ///< Transcoded copies of videos.
+  MEDIA_TABLE_FOLDER = 6          ///< A whole folder tree; accepted by deletes only.
 };
 
 /// Handles of the platform libraries; their functions are in the platform's own headers.
-struct tavodb_connection; ///< A database connection.
-struct tavodb_result;     ///< The rows of one SELECT.
-struct tlib_szlist;       ///< A list of texts.
-struct tlib_szhash;       ///< A map from text to text.
+struct tavodb_connection;  ///< A database connection.
+struct tavodb_result;      ///< The rows of one SELECT.
+struct tlib_szlist;        ///< A list of texts.
+struct tlib_szhash;        ///< A map from text to text.
 
 #endif

@@ -45,7 +45,7 @@ class Out {
   Out(const Out&) = delete;
   Out& operator=(const Out&) = delete;
   ~Out() { owner_.reset(handle_); }
-  operator typename Owner::pointer*() { return &handle_; }
+  operator typename Owner::pointer *() { return &handle_; }
 
  private:
   Owner& owner_;

@@ -43,8 +43,8 @@ constexpr bool placeholders_match(std::string_view sql, std::span<const BindKind
     BindKind kind;
   };
   constexpr std::array kPlaceholders{
-      Placeholder{"VAR", BindKind::kText},       Placeholder{"LVAR", BindKind::kText},
-      Placeholder{"NEVAR", BindKind::kText},     Placeholder{"INT", BindKind::kInt},
+      Placeholder{"VAR", BindKind::kText},      Placeholder{"LVAR", BindKind::kText},
+      Placeholder{"NEVAR", BindKind::kText},    Placeholder{"INT", BindKind::kInt},
       Placeholder{"LLINT", BindKind::kLongInt},
   };
   std::size_t used = 0;
@@ -67,7 +67,8 @@ constexpr bool placeholders_match(std::string_view sql, std::span<const BindKind
 template <class... Values>
 class Template {
  public:
-  consteval Template(const char* sql) : sql_(sql) {  // NOLINT(google-explicit-constructor): a literal
+  consteval Template(const char* sql)
+      : sql_(sql) {  // NOLINT(google-explicit-constructor): a literal
     constexpr std::array<BindKind, sizeof...(Values)> kinds{bind_kind<Values>()...};
     if (!placeholders_match(sql, kinds)) throw "placeholders and values differ";
   }

@@ -28,8 +28,12 @@ fs::path server_folder() {
 
 /// Speed over safety: the data of a test are gone in a second anyway.
 const std::vector<std::string> kSettings{
-    "fsync=off",           "synchronous_commit=off", "full_page_writes=off",
-    "shared_buffers=64MB", "max_connections=40",     "autovacuum=off",
+    "fsync=off",
+    "synchronous_commit=off",
+    "full_page_writes=off",
+    "shared_buffers=64MB",
+    "max_connections=40",
+    "autovacuum=off",
     "jit=off",
 };
 

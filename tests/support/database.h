@@ -18,8 +18,8 @@ namespace mediidx::test {
 
 using Row = std::vector<std::string>;
 
-/// The server of this test program: made and started at the first use, stopped at the end; PGHOST is
-/// set to it.
+/// The server of this test program: made and started at the first use, stopped at the end; PGHOST
+/// is set to it.
 class TestServer {
  public:
   static TestServer& get();
@@ -39,8 +39,8 @@ class TestServer {
   Parts* parts_;
 };
 
-/// Statements that the library sent through TAVODBExecute and TAVODBSelectLimit since the last clear,
-/// failed ones included. They are also kept for the checks of every statement's plan.
+/// Statements that the library sent through TAVODBExecute and TAVODBSelectLimit since the last
+/// clear, failed ones included. They are also kept for the checks of every statement's plan.
 const std::vector<std::string>& sent_statements();
 void clear_sent_statements();
 

@@ -1,7 +1,8 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-// Stands before the platform's statement calls: writes down what the library sends, and passes it on.
+// Stands before the platform's statement calls: writes down what the library sends, and passes it
+// on.
 #include <dlfcn.h>
 #include <tavodb.h>
 #include <unistd.h>
@@ -21,7 +22,8 @@ std::vector<std::string>& statements() {
   return recorded;
 }
 
-/// One file a process; a text that it holds already is not written again. Texts end with a NUL byte.
+/// One file a process; a text that it holds already is not written again. Texts end with a NUL
+/// byte.
 void keep(const std::string& sql) {
   static const char* folder = std::getenv("MEDIIDX_JOURNAL");
   static std::set<std::string> kept;

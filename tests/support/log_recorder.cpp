@@ -35,8 +35,8 @@ std::vector<std::string> logged_messages() {
   static const std::regex beginning(R"(^mediidx\w*(:\d+ | ?\(\d+\) ?))");
   std::vector<std::string> messages;
   for (const auto& line : lines()) {
-    messages.push_back(std::regex_replace(line.text, beginning, "",
-                                          std::regex_constants::format_first_only));
+    messages.push_back(
+        std::regex_replace(line.text, beginning, "", std::regex_constants::format_first_only));
   }
   return messages;
 }

@@ -1,8 +1,8 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-// Runs the tests of a program. A skipped test fails the run unless tests/allowed_skips.txt names it:
-// a line "Suite.Test reason".
+// Runs the tests of a program. A skipped test fails the run unless tests/allowed_skips.txt names
+// it: a line "Suite.Test reason".
 #include <gtest/gtest.h>
 
 #include <cstdio>

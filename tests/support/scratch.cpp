@@ -2,11 +2,10 @@
 // SPDX-License-Identifier: MIT
 #include "scratch.h"
 
+#include <json/writer.h>
 #include <tavocore.h>
 
 #include <cstdlib>
-#include <json/writer.h>
-
 #include <fstream>
 #include <iterator>
 #include <stdexcept>

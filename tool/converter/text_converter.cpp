@@ -1,0 +1,71 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+#include "converter/text_converter.h"
+
+#include <strings.h>
+
+#include <array>
+#include <cerrno>
+#include <stdexcept>
+
+namespace mediidx::tool {
+namespace {
+
+constexpr std::string_view kUtf8Mark = "\xEF\xBB\xBF";
+
+bool is_utf8(const std::string& charset) {
+  return strcasecmp(charset.c_str(), "UTF-8") == 0 || strcasecmp(charset.c_str(), "UTF8") == 0;
+}
+
+}  // namespace
+
+TextConverter::TextConverter(const std::string& from, const std::string& to)
+    : descriptor_(iconv_open(to.c_str(), from.c_str())),
+      replacement_(is_utf8(to) ? "\xEF\xBF\xBD" : "?"),
+      to_utf8_(is_utf8(to)) {
+  // iconv_open reports failure by this value, which is no pointer that could be compared to null.
+  if (descriptor_ == reinterpret_cast<iconv_t>(-1)) {  // NOLINT(performance-no-int-to-ptr)
+    throw std::invalid_argument("no conversion from " + from + " to " + to);
+  }
+}
+
+TextConverter::~TextConverter() { iconv_close(descriptor_); }
+
+std::string TextConverter::run(std::string_view text, bool is_last) {
+  std::string input = rest_ + std::string(text);
+  rest_.clear();
+  std::string out;
+  char* from = input.data();
+  std::size_t left = input.size();
+  std::array<char, 4096> buffer;
+  while (left > 0) {
+    char* to = buffer.data();
+    std::size_t room = buffer.size();
+    const auto converted = iconv(descriptor_, &from, &left, &to, &room);
+    const int error = converted == static_cast<std::size_t>(-1) ? errno : 0;
+    out.append(buffer.data(), to);
+    if (error == EINVAL && !is_last) {
+      rest_.assign(from, left);
+      break;
+    }
+    if (error == EILSEQ || error == EINVAL) {
+      out += replacement_;
+      ++from;
+      --left;
+    }
+  }
+  take_mark_off(out);
+  return out;
+}
+
+void TextConverter::take_mark_off(std::string& out) {
+  if (!at_beginning_ || out.empty()) return;
+  at_beginning_ = false;
+  if (to_utf8_ && out.starts_with(kUtf8Mark)) out.erase(0, kUtf8Mark.size());
+}
+
+std::string TextConverter::convert(std::string_view piece) { return run(piece, false); }
+
+std::string TextConverter::finish() { return run({}, true); }
+
+}  // namespace mediidx::tool

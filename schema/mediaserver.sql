@@ -8,7 +8,8 @@
 -- Kinds of index:
 --   spgist  paths. They reach 4,095 bytes, and a B-tree refuses values over 2,704; a radix tree takes
 --           them, shares their long common beginnings, and serves "=", LIKE 'exact' and LIKE 'prefix%'.
---   gin     trigrams, where a pattern begins with "%": nothing else finds the end of a text.
+--   gin     trigrams of paths, where a pattern begins with "%": nothing else finds the end of a text.
+--   gist    trigrams of shorter texts.
 --   btree   numbers, and names that a record cuts at 254 bytes.
 -- Every referencing column has one: without it, each deleted track would scan the referencing table.
 --
@@ -191,10 +192,11 @@ CREATE TABLE IF NOT EXISTS public.virtual_music (
   duration integer,
   track integer
 );
--- Each playlist that is saved or deleted looks here for its tracks, and a look-up walks all entries
--- that wait to be merged: few may wait (in kB).
+-- Every save and delete of a playlist looks for the end of a comment here. GiST, because a look-up in
+-- GIN costs a page or two per trigram, for a long path more than reading thousands of rows, and walks
+-- the entries not merged yet. A comment has 254 bytes at most; paths would be too long for GiST.
 CREATE INDEX IF NOT EXISTS virtual_music_comment_trigram ON public.virtual_music
-  USING gin (comment public.gin_trgm_ops) WITH (gin_pending_list_limit = 256);
+  USING gist (comment public.gist_trgm_ops (siglen = 256));
 
 -- Transcoded copies of videos.
 CREATE TABLE IF NOT EXISTS public.video_convert (
@@ -320,5 +322,9 @@ CREATE TABLE IF NOT EXISTS public.replaygain_track (
   rg_album_peak text
 );
 CREATE INDEX IF NOT EXISTS replaygain_track_track ON public.replaygain_track (track);
+
+-- When several artists of an album become one, nine tables are joined. Beyond eight the planner would
+-- no longer look for the best order, and scan the albums.
+DO 'BEGIN EXECUTE format(''ALTER DATABASE %I SET join_collapse_limit = 12'', current_database()); END';
 
 INSERT INTO mediidx.schema_version (version) VALUES (1) ON CONFLICT DO NOTHING;

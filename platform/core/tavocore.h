@@ -118,15 +118,19 @@ TAVOCORE_EXPORT int TLIBCFileGetKeys(const char* file, const char* keys, TLIBSZH
 /* Programs and signals */
 
 /// Runs a program, without a shell, with up to four arguments (null for an absent one) and waits.
-/// Its exit status; 128 + signal when one ended it; -1 when it cannot be started.
+/// Its exit status; 128 + signal when one ended it; -1 when it cannot be started. It reads from
+/// /dev/null and has default signal handling.
 TAVOCORE_EXPORT int TLIBCExec(const char* program, const char* arg1, const char* arg2,
                               const char* arg3, const char* arg4);
 /// Starts a program, without a shell, with the arguments up to a null, and returns its standard
-/// output (mode "r") or input ("w"). The program's own name is not among the arguments. Null on
-/// failure.
+/// output (mode "r") or input ("w"). The program's own name is not among the arguments. A program
+/// that cannot be started gives a stream that is at its end (or takes what is written to nowhere);
+/// null only for bad arguments or when no pipe or process can be made. Not for use from several
+/// threads at once.
 TAVOCORE_EXPORT FILE* TLIBCPopen(const char* program, const char* mode, const char* arg1, ...)
     __attribute__((sentinel));
-/// Closes such a stream and waits for the program; its status as TLIBCExec gives it.
+/// Closes such a stream and waits for the program; its status as TLIBCExec gives it. -1 too for a
+/// stream that is not open from TLIBCPopen, which is left alone.
 TAVOCORE_EXPORT int TLIBCPclose(FILE* stream);
 /// Sends a signal to the process whose decimal id the file holds; -1 when the file or the id is
 /// bad. Ids below 2 are never signalled.
@@ -144,7 +148,8 @@ typedef struct TAVOSHARE {
   uint32_t status;  ///< Flags.
 } TAVOSHARE;
 
-/// Writes a share's record back to the share file; negative on failure.
+/// Writes a share's record back to the share file; negative on failure, also when the file holds no
+/// share of that name. Everything else in the file is kept.
 TAVOCORE_EXPORT int TLIBShareUpdate(const TAVOSHARE* share);
 
 #ifdef __cplusplus

@@ -17,6 +17,7 @@ std::optional<std::string> read_whole_file(const char* path, std::size_t limit) 
   const Descriptor file(open(path, O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY));
   struct stat info{};
   if (!file || fstat(file.get(), &info) != 0 || !S_ISREG(info.st_mode)) return std::nullopt;
+  if (static_cast<std::size_t>(info.st_size) > limit) return std::nullopt;
   std::string content;
   std::array<char, 8192> piece;
   for (;;) {

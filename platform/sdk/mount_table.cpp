@@ -13,9 +13,8 @@ namespace {
 
 // Sorted. FUSE programs that show local disks (ntfs-3g, mergerfs, bindfs, exfat) are not among
 // them.
-constexpr std::array<std::string_view, 42> kRemoteTypes{
+constexpr std::array<std::string_view, 41> kRemoteTypes{
     "9p",
-    "acfs",
     "afs",
     "beegfs",
     "ceph",

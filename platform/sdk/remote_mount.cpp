@@ -37,15 +37,17 @@ std::string read_mountinfo() {
 /// The path with links resolved as far as it exists. What does not exist, or cannot be reached (a
 /// network mount whose server is gone), is kept as text behind it.
 std::string resolve_existing(const std::string& path) {
-  for (std::size_t end = path.size();;) {
-    const std::string existing = end == 0 ? "/" : path.substr(0, end);
-    const std::unique_ptr<char, decltype(&std::free)> resolved(realpath(existing.c_str(), nullptr),
-                                                               std::free);
-    if (resolved) return (existing == "/" ? "" : resolved.get()) + path.substr(end);
-    const auto slash = end == 0 ? std::string::npos : path.rfind('/', end - 1);
-    if (slash == std::string::npos) return path;
-    end = slash;
+  for (std::size_t end = path.size(); end > 0;) {
+    const std::unique_ptr<char, decltype(&std::free)> resolved(
+        realpath(path.substr(0, end).c_str(), nullptr), std::free);
+    if (resolved) {
+      const std::string_view folder = resolved.get();
+      const auto rest = path.substr(end);
+      return folder == "/" && !rest.empty() ? rest : std::string(folder) + rest;
+    }
+    end = path.rfind('/', end - 1);
   }
+  return path;
 }
 
 }  // namespace

@@ -227,7 +227,8 @@ void MediaInfoCueParser::ParseRemark(const Tokens& tokens) {
 
 char (&MediaInfoCueParser::TextField(
     char (__tag_TAVO_MEDIA_INFO::*field)[MEDIIDX_TEXT_SIZE]))[MEDIIDX_TEXT_SIZE] {
-  return (tracks.empty() ? albumInfo : tracks.back()).*field;
+  auto& record = tracks.empty() ? albumInfo : tracks.back();
+  return record.*field;
 }
 
 int MediaInfoCueParser::ParseCommand(std::string line, const char* cuePath) {

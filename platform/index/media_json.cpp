@@ -122,7 +122,7 @@ int MediaInfoJson2Object(const Json::Value& json, __tag_TAVO_MEDIA_INFO* info) {
   namespace platform = mediidx::platform;
   if (!info) return platform::failed(-1, TAVO_ERR_BAD_PARAMETERS, "media_json.cpp", 1);
   return platform::no_throw(-1, "media_json.cpp", 2, [&] {
-    *info = {};
+    std::memset(info, 0, sizeof *info);
     if (!json.isObject() || !platform::fill_path(json["szPath"], *info)) {
       return platform::failed(-1, TAVO_ERR_BAD_PARAMETERS, "media_json.cpp", 3);
     }

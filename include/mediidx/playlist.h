@@ -28,7 +28,8 @@ MEDIIDX_EXPORT struct _PLAYLIST_REC* ParsePlayList(const char* playlistId, int* 
 MEDIIDX_EXPORT struct _PLAYLIST_REC* ParsePlayListByField(const char* playlistId, int* count,
                                                           int offset, int limit, const char* fields,
                                                           int flags);
-/// The same for the playlist's path.
+/// The same for the playlist's path. With all flags and a negative limit the entries are only
+/// counted, in little memory and without the database.
 MEDIIDX_EXPORT struct _PLAYLIST_REC* ParsePlayListByFieldGivenPath(const char* playlistPath,
                                                                    int* count, int offset,
                                                                    int limit, const char* fields,

@@ -3,16 +3,15 @@
 #include "database/playlist_count.h"
 
 #include "mediidx/playlist.h"
-#include "support/owned.h"
 
 namespace mediidx {
 
 int playlist_song_count(const char* path) {
   constexpr int kEveryEntry = MEDIIDX_KEEP_KNOWN | MEDIIDX_KEEP_UNKNOWN | MEDIIDX_KEEP_STREAMS;
   static_assert(kEveryEntry == 7);
+  constexpr int kCountOnly = -1;
   int count = 0;
-  const Owned<_PLAYLIST_REC, TAVOPlaylistRecFree> entries(
-      ParsePlayListByFieldGivenPath(path, &count, 0, 0, "id, path", kEveryEntry));
+  ParsePlayListByFieldGivenPath(path, &count, 0, kCountOnly, "id, path", kEveryEntry);
   return count;
 }
 

@@ -64,12 +64,10 @@ bool read_playlist(const std::string& playlist_path, PlaylistFormat format,
   return !std::ferror(file.get());
 }
 
-int count_playlist_entries(const std::string& playlist_path) {
-  if (playlist_path.find('.') == playlist_path.npos) return 0;
-  const auto format = playlist_format(playlist_path);
+int count_playlist_entries(const std::string& playlist_path, PlaylistFormat format) {
   int count = 0;
-  if (!format || !read_playlist(playlist_path, *format, [&](auto&&...) { ++count; })) return 0;
-  return count;
+  const bool read = read_playlist(playlist_path, format, [&](auto&&...) { ++count; });
+  return read ? count : 0;
 }
 
 }  // namespace mediidx

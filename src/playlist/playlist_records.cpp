@@ -17,6 +17,8 @@ namespace {
 constexpr int kListHint = 0x14000;
 constexpr int kHashHint = 8192;
 
+constexpr int kEveryEntry = MEDIIDX_KEEP_KNOWN | MEDIIDX_KEEP_UNKNOWN | MEDIIDX_KEEP_STREAMS;
+
 using OwnedBatch = Owned<MEDIA_DB_HANDLE, MediaInfoDBBatchClose>;
 
 /// Tags of the entry at a position of the path list.
@@ -135,6 +137,10 @@ PlaylistRecords read_playlist_records(const std::string& playlist_path, const Pl
   }
   const auto format = playlist_format(playlist_path);
   if (!format) return {};
+  // Every entry is kept and none handed out: there is nothing to look up.
+  if (page.limit < 0 && (page.flags & kEveryEntry) == kEveryEntry) {
+    return {nullptr, count_playlist_entries(playlist_path, *format)};
+  }
   Entries entries;
   entries.paths.reset(TLIBCSzListAlloc(kListHint));
   if (!entries.paths) {

@@ -1,0 +1,4 @@
+File=
+File1= 	
+=File
+xFile9=a=b

@@ -7,6 +7,7 @@
 #include <csignal>
 #include <cstdarg>
 #include <cstdio>
+#include <memory>
 #include <string_view>
 #include <unordered_map>
 #include <vector>
@@ -64,14 +65,33 @@ bool open_pipe(Pipe& pipe) {
   return true;
 }
 
-std::FILE* remember(std::FILE* stream, pid_t pid) {
-  if (stream) children().insert_or_assign(stream, pid);
-  return stream;
-}
+using Stream = std::unique_ptr<std::FILE, decltype(&std::fclose)>;
+
+/// A stream and the entry that will lead to its child: made before the child is, because from then
+/// on nothing may fail any more.
+class NewStream {
+ public:
+  explicit NewStream(std::FILE* stream) : stream_(stream, std::fclose) {
+    entry_.emplace(stream, kNotStarted);
+    children().reserve(children().size() + 1);
+  }
+
+  explicit operator bool() const { return static_cast<bool>(stream_); }
+  std::FILE* remember(pid_t pid) {
+    entry_.begin()->second = pid;
+    children().insert(entry_.extract(entry_.begin()));
+    return stream_.release();
+  }
+
+ private:
+  Stream stream_;
+  std::unordered_map<std::FILE*, pid_t> entry_;
+};
 
 /// A stream for a program that cannot be started: empty, or swallowing what is written.
 std::FILE* open_nowhere(bool reading) {
-  return remember(std::fopen("/dev/null", reading ? "re" : "we"), kNotStarted);
+  NewStream nowhere(std::fopen("/dev/null", reading ? "re" : "we"));
+  return nowhere ? nowhere.remember(kNotStarted) : nullptr;
 }
 
 std::FILE* open_program(const std::vector<const char*>& arguments, bool reading) {
@@ -79,16 +99,13 @@ std::FILE* open_program(const std::vector<const char*>& arguments, bool reading)
   if (!open_pipe(pipe)) return nullptr;
   Descriptor& ours = reading ? pipe.read_end : pipe.write_end;
   const int theirs = (reading ? pipe.write_end : pipe.read_end).get();
-  children().reserve(children().size() + 1);
-  // The stream first: once the program runs, nothing that follows may fail.
-  std::FILE* stream = fdopen(ours.get(), reading ? "r" : "w");
+  NewStream stream(fdopen(ours.get(), reading ? "r" : "w"));
   if (!stream) return nullptr;
   ours.release();
   const StartedChild child =
       start_child(arguments, reading ? ChildStreams{.output = theirs, .input_from_nowhere = true}
                                      : ChildStreams{.input = theirs});
-  if (child.error == 0) return remember(stream, child.pid);
-  std::fclose(stream);
+  if (child.error == 0) return stream.remember(child.pid);
   const bool no_process = child.error == EAGAIN || child.error == ENOMEM;
   return no_process ? nullptr : open_nowhere(reading);
 }

@@ -146,7 +146,9 @@ long DatabaseTest::count(const std::string& table, const std::string& where) {
 
 void DatabaseTest::cut_connections() {
   Connection(TestServer::get().socket_folder(), "postgres")
-      .run("SELECT pg_terminate_backend(pid) FROM pg_stat_activity WHERE datname = 'mediaserver'");
+      .run(
+          "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity "
+          "WHERE datname = 'mediaserver'");
 }
 
 std::string quoted(const std::string& text) {

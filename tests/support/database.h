@@ -54,7 +54,7 @@ class DatabaseTest : public testing::Test {
   /// The one value of a statement.
   std::string value(const std::string& sql);
   long count(const std::string& table, const std::string& where = "true");
-  /// Ends every session on "mediaserver", as a server that went away does.
+  /// Ends every session on "mediaserver", as a server that went away does, and waits for it.
   void cut_connections();
 
   ScratchRoot root;

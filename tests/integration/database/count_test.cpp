@@ -99,7 +99,7 @@ TEST_F(CountingRows, LogsAFailedStatement) {
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
 TEST_F(CountingRows, FailsWithoutMemory) {
-  const FailingAllocation allocation(sizeof(MEDIA_DB_HANDLE));
+  const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
   EXPECT_EQ(MediaInfoDBGetCount(MEDIA_TABLE_PHOTO, "*", "", "", 0), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc")));
 }

@@ -95,7 +95,7 @@ TEST_F(Deleting, FailsWithoutAConnection) {
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
 TEST_F(Deleting, FailsWithoutMemory) {
-  const FailingAllocation allocation(sizeof(MEDIA_DB_HANDLE));
+  const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
   EXPECT_EQ(MediaInfoDBDelete(MEDIA_TABLE_PHOTO, "/a"), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc")));
 }

@@ -89,12 +89,19 @@ char* format_with(const char* function, const char* format, va_list& values) {
 }
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
-constinit std::size_t g_failing_size = 0;
+/// Plain data: allocations happen before any constructor ran.
+struct AllocationSwitch {
+  Allocator allocator;
+  std::size_t bytes;
+  int calls_left;
+};
+constinit AllocationSwitch g_allocation{};
 
-bool allocation_fails(std::size_t bytes) {
-  if (g_failing_size == 0 || bytes != g_failing_size) return false;
-  g_failing_size = 0;
-  return true;
+bool allocation_fails(Allocator allocator, std::size_t bytes) {
+  auto& chosen = g_allocation;
+  if (chosen.calls_left == 0 || chosen.allocator != allocator || chosen.bytes != bytes)
+    return false;
+  return --chosen.calls_left == 0;
 }
 #endif
 
@@ -109,8 +116,10 @@ int Failing::calls() const { return switches().at(function_).calls; }
 const ConnectArguments& last_connect() { return g_last_connect; }
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
-FailingAllocation::FailingAllocation(std::size_t bytes) { g_failing_size = bytes; }
-FailingAllocation::~FailingAllocation() { g_failing_size = 0; }
+FailingAllocation::FailingAllocation(Allocator allocator, std::size_t bytes, int nth) {
+  g_allocation = {allocator, bytes, nth};
+}
+FailingAllocation::~FailingAllocation() { g_allocation = {}; }
 #endif
 
 }  // namespace mediidx::test
@@ -198,21 +207,25 @@ TAVOCORE_EXPORT int TLIBCSzHashSetValue(TLIBSZHASH* hash, const char* key, const
 }
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
+using mediidx::test::allocation_fails;
+using mediidx::test::Allocator;
+
 // The C library's allocator under its second names.
 void* __libc_malloc(std::size_t bytes);
 void* __libc_calloc(std::size_t count, std::size_t bytes);
 void* __libc_realloc(void* block, std::size_t bytes);
 
 __attribute__((visibility("default"))) void* malloc(std::size_t bytes) noexcept {
-  return mediidx::test::allocation_fails(bytes) ? nullptr : __libc_malloc(bytes);
+  return allocation_fails(Allocator::kMalloc, bytes) ? nullptr : __libc_malloc(bytes);
 }
 
 __attribute__((visibility("default"))) void* calloc(std::size_t count, std::size_t bytes) noexcept {
-  return mediidx::test::allocation_fails(count * bytes) ? nullptr : __libc_calloc(count, bytes);
+  return allocation_fails(Allocator::kCalloc, count * bytes) ? nullptr
+                                                             : __libc_calloc(count, bytes);
 }
 
 __attribute__((visibility("default"))) void* realloc(void* block, std::size_t bytes) noexcept {
-  return mediidx::test::allocation_fails(bytes) ? nullptr : __libc_realloc(block, bytes);
+  return allocation_fails(Allocator::kRealloc, bytes) ? nullptr : __libc_realloc(block, bytes);
 }
 #endif
 }

@@ -40,10 +40,12 @@ const ConnectArguments& last_connect();
 #if !defined(__SANITIZE_ADDRESS__)
 #define MEDIIDX_ALLOCATIONS_CAN_FAIL 1
 
-/// While it lives, the first allocation of exactly this many bytes fails.
+enum class Allocator { kMalloc, kCalloc, kRealloc };
+
+/// While it lives, the nth allocation (from 1) of exactly this many bytes by this function fails.
 class FailingAllocation {
  public:
-  explicit FailingAllocation(std::size_t bytes);
+  FailingAllocation(Allocator allocator, std::size_t bytes, int nth = 1);
   ~FailingAllocation();
   FailingAllocation(const FailingAllocation&) = delete;
   FailingAllocation& operator=(const FailingAllocation&) = delete;

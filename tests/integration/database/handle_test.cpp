@@ -148,7 +148,7 @@ TEST_F(OpeningAHandle, LogsAFailedSelect) {
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
 TEST_F(OpeningAHandle, FailsWithoutMemory) {
-  const FailingAllocation allocation(sizeof(MEDIA_DB_HANDLE));
+  const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
   EXPECT_EQ(open(MEDIA_TABLE_VIDEO), nullptr);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc")));
 }
@@ -156,7 +156,7 @@ TEST_F(OpeningAHandle, FailsWithoutMemory) {
 TEST_F(OpeningAHandle, FailsInSilenceWithoutMemoryForItsCondition) {
   const std::string where = "path='" + std::string(3210, 'x') + "'";
   MediaDBConnGet();
-  const FailingAllocation allocation(2 * where.size() + 1);
+  const FailingAllocation allocation(Allocator::kCalloc, 2 * where.size() + 1);
   EXPECT_EQ(open(MEDIA_TABLE_VIDEO, nullptr, where.c_str(), nullptr, nullptr, 0, 0, 0), nullptr);
   EXPECT_THAT(log_lines(), IsEmpty());
 }

@@ -136,7 +136,7 @@ TEST_F(MarkingRows, StopsWithoutMemory) {
   MediaDBConnGet();
   for (const std::size_t bytes : {2U * 1234U + 1U, 3U * 1234U + 1U}) {
     clear_log();
-    const FailingAllocation allocation(bytes);
+    const FailingAllocation allocation(Allocator::kMalloc, bytes);
     MediaInfoDBSetOnline(path.c_str(), 0, 0);
     EXPECT_THAT(log_lines(),
                 ElementsAre(parens("Failed to malloc(" + std::to_string(bytes) + ")")));

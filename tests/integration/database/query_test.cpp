@@ -376,7 +376,7 @@ TEST_F(GettingOneByField, FailsWithoutMemory) {
   const std::string path(1234, 'x');
   for (const std::size_t bytes : {2U * 1234U + 1U, 3U * 1234U + 1U}) {
     clear_log();
-    const FailingAllocation allocation(bytes);
+    const FailingAllocation allocation(Allocator::kMalloc, bytes);
     EXPECT_EQ(MediaInfoDBGetOneByField(MEDIA_TABLE_PHOTO, path.c_str(), "path", &info), -1);
     EXPECT_THAT(log_lines(),
                 ElementsAre(parens("Failed to malloc(" + std::to_string(bytes) + ")")));

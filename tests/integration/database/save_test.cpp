@@ -93,14 +93,19 @@ TEST_P(SavingAKind, LogsAFailedStatement) {
 }
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
-TEST_P(SavingAKind, FailsWithoutMemoryForTheDeleteOrTheInsert) {
+TEST_P(SavingAKind, FailsWithoutMemory) {
   const auto path = shared("x");
-  MediaDBConnGet();
-  {
-    const FailingAllocation of_the_delete(sizeof(MEDIA_DB_HANDLE));
-    EXPECT_EQ(save(GetParam().type, record(path)), 0);
-  }
+  const FailingAllocation second(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE), 2);
+  EXPECT_EQ(save(GetParam().type, record(path)), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc")));
+  EXPECT_EQ(count(table()), 0);
+}
+
+TEST_P(SavingAKind, GoesOnWithoutMemoryForTheDeleteBeforeIt) {
+  const auto path = shared("x");
+  const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
+  EXPECT_EQ(save(GetParam().type, record(path)), 0);
+  EXPECT_EQ(log_lines().front(), parens("Failed to malloc"));
 }
 #endif
 
@@ -399,7 +404,7 @@ TEST_F(SavingATranscodedCopy, WritesNothingAndSucceedsWhenItsStatementCannotBeBu
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
 TEST_F(SavingATranscodedCopy, FailsWithoutMemory) {
-  const FailingAllocation allocation(sizeof(MEDIA_DB_HANDLE));
+  const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
   auto copy = copy_of("/v.mkv");
   EXPECT_EQ(MediaInfoVideoConvertDBSave(&copy), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc")));

@@ -80,6 +80,7 @@ TEST_F(Statement, OfAKnownFolderIsFilledToTheLetter) {
 class StatementOfAnUpdate : public MediaTest, public testing::WithParamInterface<SaveCase> {};
 
 TEST_P(StatementOfAnUpdate, IsFilledToTheLetter) {
+  rows("INSERT INTO track(id, path, is_virtual) VALUES(7, '/p', 'FALSE')");
   auto info = record("/p");
   info.id = 7;
   ASSERT_EQ(MediaInfoDBUpdate(GetParam().type, &info), 0);

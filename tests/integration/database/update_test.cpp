@@ -201,14 +201,15 @@ TEST_F(UpdatingAFile, FailsWhenATextCannotBeEscaped) {
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
 TEST_F(UpdatingAFile, FailsWithoutMemoryForAText) {
   auto info = record("/" + std::string(1233, 'x'));
-  const FailingAllocation allocation(2 * 1234 + 1);
+  const FailingAllocation allocation(Allocator::kMalloc, 2 * 1234 + 1);
   EXPECT_EQ(MediaInfoDBUpdate(MEDIA_TABLE_PHOTO, &info), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc(2469)")));
 }
 
 TEST_F(UpdatingAFile, FailsWithoutMemoryForItsStatement) {
   auto info = record("/" + std::string(1233, 'x'));
-  const FailingAllocation allocation(1234 + 3 * 5 + 512);  // path, three times "epoch"
+  const FailingAllocation allocation(Allocator::kMalloc,
+                                     1234 + 3 * 5 + 512);  // path, three times "epoch"
   EXPECT_EQ(MediaInfoDBUpdate(MEDIA_TABLE_PHOTO, &info), -1);
   EXPECT_THAT(log_lines(), ElementsAre(parens("Failed to malloc(1761)")));
 }

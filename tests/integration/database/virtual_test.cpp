@@ -153,12 +153,13 @@ TEST_F(DeletingVirtualTracks, RemovesThoseOfTheCueSheetOnly) {
   add(shared("m.flac"), "00:00:00", 1);
   add(shared("m.flac"), "03:10:37", 2);
   ASSERT_EQ(save(), 0);
-  cue = record(shared("other.cue"));
-  ASSERT_EQ(save(), 0);
+  auto other_cue = record(shared("other.cue"));
+  _PLAYLIST_REC other{record(shared("other.flac")), nullptr};
+  ASSERT_EQ(MediaInfoVirtualDBSave(&other, &other_cue), 0);
   EXPECT_EQ(MediaInfoVirtualDBDelete(shared("disc.cue").c_str()), 0);
-  EXPECT_EQ(count("virtual_music"), 2);
-  EXPECT_EQ(count("track"), 2);
-  EXPECT_EQ(count("virtual_info_track", "cue_sheet_path = " + quoted(shared("other.cue"))), 2);
+  EXPECT_EQ(value("SELECT path FROM virtual_music"), shared("other.flac"));
+  EXPECT_EQ(value("SELECT path FROM track"), shared("other.flac"));
+  EXPECT_EQ(value("SELECT cue_sheet_path FROM virtual_info_track"), shared("other.cue"));
 }
 
 TEST_F(DeletingVirtualTracks, LeavesTheAudioFileItself) {

@@ -3,6 +3,7 @@
 
 // Emptying the whole database, and its vacuum.
 #include "database/session.h"
+#include "mediidx/request.h"
 #include "support/no_throw.h"
 #include "support/statement.h"
 
@@ -46,3 +47,6 @@ extern "C" int MediaInfoDBDeleteAll() {
 extern "C" int MediaDBVacuum() {
   return mediidx::no_throw(mediidx::kDatabaseLog, -1, mediidx::vacuum);
 }
+
+// The second name of the same function.
+extern "C" [[gnu::alias("MediaDBVacuum")]] int TAVOMediaIndexDBVacuum();

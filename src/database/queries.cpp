@@ -12,6 +12,7 @@
 #include "database/select.h"
 #include "database/session.h"
 #include "database/table_types.h"
+#include "mediidx/request.h"
 #include "support/no_throw.h"
 #include "support/statement.h"
 
@@ -171,3 +172,7 @@ extern "C" const char* PlaylistDBGet(MEDIA_DB_HANDLE* handle) {
   return no_throw(kDatabaseLog, static_cast<const char*>(nullptr),
                   [&] { return mediidx::next_path(handle); });
 }
+
+// The second name of the same function.
+extern "C" [[gnu::alias("MediaInfoDBGetOne")]] int TAVOMediaIndexDBGetOne(
+    MEDIA_TABLE_TYPE tableType, const char* path, __tag_TAVO_MEDIA_INFO* info, int suffixMatch);

@@ -1,0 +1,35 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+#include "cli/interrupt.h"
+
+#include <signal.h>
+
+#include <initializer_list>
+
+namespace mediidx::tool {
+namespace {
+
+volatile sig_atomic_t first_signal = 0;
+
+void note(int number) {
+  if (first_signal == 0) first_signal = number;
+}
+
+}  // namespace
+
+void note_signals() {
+  struct sigaction action{};
+  action.sa_handler = note;
+  action.sa_flags = SA_RESTART;
+  for (const int number : {SIGINT, SIGTERM, SIGHUP}) {
+    // What is ignored, as nohup does, stays ignored.
+    struct sigaction current{};
+    if (sigaction(number, nullptr, &current) == 0 && current.sa_handler == SIG_IGN) continue;
+    sigaction(number, &action, nullptr);
+  }
+  signal(SIGPIPE, SIG_IGN);
+}
+
+int noted_signal() { return first_signal; }
+
+}  // namespace mediidx::tool

@@ -1,0 +1,19 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+
+/// Being asked to stop: noticed between two files, never in the middle of one.
+#ifndef MEDIIDX_TOOL_CLI_INTERRUPT_H_
+#define MEDIIDX_TOOL_CLI_INTERRUPT_H_
+
+namespace mediidx::tool {
+
+/// From now on SIGINT, SIGTERM and SIGHUP are only noted, and a closed output is an error of the
+/// write instead of the end of the process: a server that was started has to be stopped.
+void note_signals();
+
+/// The signal that came first; 0 while none has.
+int noted_signal();
+
+}  // namespace mediidx::tool
+
+#endif

@@ -1,0 +1,97 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+#include "cli/verbs.h"
+
+#include <signal.h>
+
+#include <exception>
+#include <limits>
+
+#include "cli/interrupt.h"
+#include "cli/output.h"
+
+namespace mediidx::tool {
+namespace {
+
+constexpr std::size_t kAnyNumber = std::numeric_limits<std::size_t>::max();
+constexpr std::size_t kWordsOfAVerb = 2;
+
+constexpr Option kListOptions[] = {
+    {"--json", nullptr, "print a JSON array with every column"},
+};
+
+int run_help(const Arguments& arguments) {
+  std::string name;
+  for (const auto& word : arguments.operands) name += (name.empty() ? "" : " ") + word;
+  if (name.empty()) {
+    put(general_help(verbs()));
+    return kExitDone;
+  }
+  for (const auto& verb : verbs()) {
+    if (name != verb.name) continue;
+    put(verb_help(verb));
+    return kExitDone;
+  }
+  throw UsageError("unknown verb \"" + name + "\"");
+}
+
+int run_version(const Arguments&) {
+  put("mediidx " MEDIIDX_VERSION "\n");
+  return kExitDone;
+}
+
+const Verb kVerbs[] = {
+    {"index",
+     "FOLDER...",
+     "index the media in these folders, from now on too",
+     1,
+     kAnyNumber,
+     {},
+     {},
+     run_index},
+    {"list", "music|albums|artists|genres|photos|videos|playlists|folders",
+     "show what is in the index", 1, 1, kListOptions, list_choices(), run_list},
+    {"db init",
+     "",
+     "make the database and its tables, where they are missing",
+     0,
+     0,
+     {},
+     {},
+     run_db_init},
+    {"help", "[VERB]", "show this help, or that of a verb", 0, kWordsOfAVerb, {}, {}, run_help},
+    {"version", "", "show the version", 0, 0, {}, {}, run_version},
+};
+
+int run(const std::vector<std::string>& words) {
+  if (words.size() == 1 && words[0] == "--version") return run_version({});
+  const auto arguments = parse_arguments(verbs(), words);
+  if (arguments.has("--help")) {
+    put(arguments.verb ? verb_help(*arguments.verb) : general_help(verbs()));
+    return kExitDone;
+  }
+  if (!arguments.verb) throw UsageError("what shall be done?");
+  return arguments.verb->run(arguments);
+}
+
+}  // namespace
+
+std::span<const Verb> verbs() { return kVerbs; }
+
+int run_command(const std::vector<std::string>& words) {
+  try {
+    const int status = run(words);
+    flush_output();
+    return status;
+  } catch (const UsageError& error) {
+    complain(std::string(error.what()) + "\nTry \"mediidx help\".");
+    return kExitUsage;
+  } catch (const OutputClosed&) {
+    return kExitSignal + SIGPIPE;
+  } catch (const std::exception& error) {
+    complain(error.what());
+  }
+  return noted_signal() ? kExitSignal + noted_signal() : kExitFailed;
+}
+
+}  // namespace mediidx::tool

@@ -1,0 +1,41 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+
+/// What the command can do: one table, from which it is run and the help is made.
+#ifndef MEDIIDX_TOOL_CLI_VERBS_H_
+#define MEDIIDX_TOOL_CLI_VERBS_H_
+
+#include <span>
+#include <string>
+#include <vector>
+
+#include "cli/arguments.h"
+
+namespace mediidx::tool {
+
+/// Exit statuses; a signal ends with 128 and its number.
+enum ExitStatus {
+  kExitDone = 0,
+  kExitFailed = 1,
+  kExitUsage = 2,
+  kExitSomeFailed = 3,  ///< Done, but for some files.
+  kExitSignal = 128,
+};
+
+std::span<const Verb> verbs();
+
+/// Runs the command line behind the program's name; its exit status. Complains on standard error.
+int run_command(const std::vector<std::string>& words);
+
+/* The verbs. Each returns its exit status, and throws std::exception for what ends it. */
+
+int run_index(const Arguments& arguments);
+int run_list(const Arguments& arguments);
+int run_db_init(const Arguments& arguments);
+
+/// The things that "list" knows.
+std::span<const char* const> list_choices();
+
+}  // namespace mediidx::tool
+
+#endif

@@ -189,12 +189,13 @@ std::vector<Row> AlbumRules::rows_of_database() {
   return rows(
       "SELECT path, t.track, COALESCE(cue_sheet_path, '') AS cue, album, album_artist, "
       "album_artist_sort, album_artist_search, from_album_artist, artist, has_album_artist "
-      "FROM track t JOIN album_track a ON t.id = a.track JOIN artist_track r ON t.id = r.track "
+      "FROM track t LEFT JOIN album_track a ON t.id = a.track "
+      "LEFT JOIN artist_track r ON t.id = r.track "
       "LEFT JOIN virtual_info_track v ON t.id = v.track ORDER BY path, t.track, cue");
 }
 
 void AlbumRules::run_sequence(unsigned seed) {
-  rows("TRUNCATE track, music, virtual_music CASCADE");
+  rows("DELETE FROM track; DELETE FROM music; DELETE FROM virtual_music");
   random_.seed(seed);
   model_ = {};
   script_.str("");
@@ -203,7 +204,6 @@ void AlbumRules::run_sequence(unsigned seed) {
 
   EXPECT_EQ(rows_of_database(), rows_of_model()) << "seed " << seed << ", steps:\n"
                                                  << script_.str();
-  EXPECT_EQ(count("track"), static_cast<long>(model_.rows().size())) << "seed " << seed;
 }
 
 TEST_P(AlbumRules, HoldAfterRandomSavesAndDeletes) {

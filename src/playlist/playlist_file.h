@@ -22,8 +22,8 @@ bool read_playlist(const std::string& playlist_path, PlaylistFormat format,
                    const EntryVisitor& visit);
 
 /// The number of entries that resolve, in little memory whatever their number; 0 when the file
-/// cannot be read or is no playlist.
-int count_playlist_entries(const std::string& playlist_path);
+/// cannot be read.
+int count_playlist_entries(const std::string& playlist_path, PlaylistFormat format);
 
 }  // namespace mediidx
 

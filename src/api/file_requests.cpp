@@ -10,6 +10,7 @@
 
 #include "api/file_path.h"
 #include "api/replay_gain.h"
+#include "api/virtual_tracks.h"
 #include "mediidx/database.h"
 #include "mediidx/request.h"
 #include "support/log.h"
@@ -45,7 +46,8 @@ int add(Record* info, MEDIA_TABLE_TYPE type) {
   if (!info) return add_bad_parameter();
   if (!is_no_folder(info->path)) return -1;
   if (!belongs(info->path, type)) return 0;
-  return MediaInfoDBSave(type, info) == 0 ? 0 : not_saved();
+  if (MediaInfoDBSave(type, info) != 0) return not_saved();
+  return add_virtual_tracks(*info, type);
 }
 
 int save_replay_gain(const Json::Value& json, std::uint32_t id) {
@@ -63,7 +65,8 @@ int add(const Json::Value& json, MEDIA_TABLE_TYPE type) {
   const auto info = std::make_unique<Record>();
   if (MediaInfoJson2Object(json, info.get()) != 0) return not_saved();
   if (MediaInfoDBSave(type, info.get()) != 0) return not_saved();
-  return type == MEDIA_TABLE_MUSIC ? save_replay_gain(json, info->id) : 0;
+  if (type == MEDIA_TABLE_MUSIC) return save_replay_gain(json, info->id);
+  return add_virtual_tracks(*info, type);
 }
 
 /// What a file of this extension is; nothing when it is no medium.

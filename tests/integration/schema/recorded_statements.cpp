@@ -4,6 +4,7 @@
 
 #include <filesystem>
 #include <fstream>
+#include <sstream>
 #include <tuple>
 
 #include "sql_text.h"
@@ -31,13 +32,14 @@ void read(const fs::path& file, Shapes& shapes) {
   }
 }
 
+/// A file is named for its program. Only programs of this build count: what one that is gone left
+/// behind says nothing.
 Shapes read_journal() {
   const fs::path folder = MEDIIDX_JOURNAL_FOLDER;
   Shapes shapes;
-  std::error_code missing;
-  for (const auto& file : fs::directory_iterator(folder, missing)) {
-    // A file is named for its program; that of a program which is no longer built says nothing.
-    if (fs::exists(folder.parent_path() / file.path().stem())) read(file.path(), shapes);
+  std::istringstream programs(MEDIIDX_RECORDED_PROGRAMS);
+  for (std::string program; std::getline(programs, program, ',');) {
+    read(folder / (program + ".statements"), shapes);
   }
   return shapes;
 }

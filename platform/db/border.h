@@ -1,23 +1,25 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-/// The border of the C functions: nothing escapes it.
+/// The border of the exported functions: no exception passes it.
 #ifndef TAVODB_BORDER_H_
 #define TAVODB_BORDER_H_
 
 #include <utility>
 
-namespace tavodb {
+namespace mediidx::platform {
 
+/// Runs `body` and returns what it returns; an exception (memory that ran out) becomes
+/// `on_failure`.
 template <class Result, class Body>
-Result guarded(Result on_failure, Body &&body) noexcept {
+Result no_throw(Result on_failure, Body&& body) noexcept {
   try {
     return std::forward<Body>(body)();
-  } catch (...) { // without memory there is nothing more to say
+  } catch (...) {
     return on_failure;
   }
 }
 
-} // namespace tavodb
+}  // namespace mediidx::platform
 
 #endif

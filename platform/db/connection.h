@@ -1,65 +1,61 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-/// The connection and result types behind the handles.
+/// One session with the server, taken up again when it is found dead.
 #ifndef TAVODB_CONNECTION_H_
 #define TAVODB_CONNECTION_H_
 
 #include <libpq-fe.h>
+#include <tavodb.h>
 
 #include <memory>
 #include <string>
-#include <unordered_map>
 
-#include "tavodb.h"
+#include "result.h"
 
-namespace tavodb {
-
-struct ClearResult {
-  void operator()(PGresult *result) const { PQclear(result); }
-};
-using OwnedPgResult = std::unique_ptr<PGresult, ClearResult>;
+namespace mediidx::platform {
 
 struct FinishConnection {
-  void operator()(PGconn *conn) const { PQfinish(conn); }
+  void operator()(PGconn* conn) const noexcept { PQfinish(conn); }
 };
-using OwnedPgConnection = std::unique_ptr<PGconn, FinishConnection>;
 
-} // namespace tavodb
+class Connection {
+ public:
+  /// Connects and settles the session; null values are libpq's own. Throws std::runtime_error with
+  /// the reason.
+  Connection(const char* host, const char* user, const char* password, const char* database);
+  Connection(const Connection&) = delete;
+  Connection& operator=(const Connection&) = delete;
 
-/// A connection. `affected` and `error` are those of the last statement.
-struct tavodb_connection {
-  tavodb::OwnedPgConnection pg;
-  int affected = 0;
-  std::string error;
+  /// Sends one statement, once. Null, with the reason in error(), when it failed or could not be
+  /// sent. Before it is sent, a session found dead is taken up again; but not within a transaction,
+  /// whose earlier statements are lost: this one fails and the next starts afresh.
+  OwnedRows run(const std::string& statement);
 
-  /// Re-establishes a connection that is found dead, once; false when there is
-  /// none to be had.
+  /// Rows that the last statement touched or returned; -1 when it failed.
+  int affected_rows() const { return affected_rows_; }
+  void set_affected_rows(int count) { affected_rows_ = count; }
+  /// The reason of the last failure.
+  const std::string& error() const { return error_; }
+  void set_error(std::string_view message);
+
+ private:
+  bool is_alive();
   bool make_alive();
-  /// Runs one statement; its rows, or a null pointer on failure.
-  tavodb::OwnedPgResult run(const std::string &statement);
-  /// The session settings that every caller relies on, whatever the environment
-  /// says.
-  bool set_up_session();
+  bool settle();
+  static void receive_notice(void* connection, const PGresult* notice);
 
-private:
-  bool is_dead();
+  std::unique_ptr<PGconn, FinishConnection> conn_;
+  std::string error_;
+  int affected_rows_ = 0;
+  bool was_dismissed_ = false;  ///< The server said that it ends the session.
+  bool in_transaction_ = false;
 };
 
-/// The rows of a SELECT, and where the walk over them stands.
-struct tavodb_result {
-  explicit tavodb_result(tavodb::OwnedPgResult result);
+}  // namespace mediidx::platform
 
-  /// The number of a column; -1 when there is none of this name. Like names in
-  /// statements, names are told apart without regard to the case of ASCII
-  /// letters.
-  int column(const char *name) const;
-
-  tavodb::OwnedPgResult pg;
-  uint32_t next = 0;
-
-private:
-  std::unordered_map<std::string, int> columns_;
+struct tavodb_connection : mediidx::platform::Connection {
+  using Connection::Connection;
 };
 
 #endif

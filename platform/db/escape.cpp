@@ -1,170 +1,103 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
+#include "escape.h"
 
-// Values made safe. Strings are standard-conforming in every session: only the
-// quote is special in a literal, and the backslash only where LIKE reads it.
-#include <cstdarg>
-#include <cstdlib>
+#include <tavodb.h>
+
 #include <cstring>
-#include <optional>
-#include <string>
-#include <string_view>
+#include <span>
 
 #include "border.h"
-#include "tavodb.h"
+
+namespace mediidx::platform {
+
+void append_literal(std::string& out, std::string_view value) {
+  for (std::size_t quote; (quote = value.find('\'')) != value.npos;) {
+    out.append(value, 0, quote).append("''");
+    value.remove_prefix(quote + 1);
+  }
+  out.append(value);
+}
+
+void append_pattern(std::string& out, std::string_view value) {
+  for (const char c : value) {
+    if (c == '\\' || c == '%' || c == '_') out += '\\';
+    if (c == '\'') out += '\'';
+    out += c;
+  }
+}
+
+std::optional<std::string> escape_condition(std::string_view condition) {
+  const auto open = condition.find('\'');
+  if (open == condition.npos) return std::string(condition);
+  const auto close = condition.rfind('\'');
+  if (close == open) return std::nullopt;
+  std::string out(condition.substr(0, open + 1));
+  append_literal(out, condition.substr(open + 1, close - open - 1));
+  out.append(condition.substr(close));
+  return out;
+}
 
 namespace {
 
-bool is_like_special(char c) { return c == '\\' || c == '%' || c == '_'; }
+/// Copies a text and its terminator; -1, and an empty text where there is room, when it is too
+/// long.
+int store(std::span<char> destination, std::string_view text) {
+  if (destination.empty()) return -1;
+  const bool fits = text.size() < destination.size();
+  const auto length = fits ? text.copy(destination.data(), text.size()) : 0;
+  destination[length] = '\0';
+  return fits ? 0 : -1;
+}
 
-void append_literal(std::string &out, std::string_view value) {
-  for (const char c : value) {
-    if (c == '\'')
-      out += '\'';
-    out += c;
+/// No statement can hold a NUL: it ends the text.
+int escape_literal(std::span<char> destination, const char* source, std::size_t length) {
+  if (!destination.data() || !source) return -1;
+  std::string escaped;
+  append_literal(escaped, {source, strnlen(source, length)});
+  return store(destination, escaped);
+}
+
+int escape_pattern(std::span<char> destination, const char* source) {
+  if (!destination.data() || !source) return -1;
+  std::string escaped;
+  for (const char* c = source; *c; ++c) {
+    if (*c == '\\' || *c == '%' || *c == '_') escaped += '\\';
+    escaped += *c;
   }
+  return store(destination, escaped);
 }
 
-void append_pattern(std::string &out, std::string_view value) {
-  for (const char c : value) {
-    if (c == '\'')
-      out += '\'';
-    if (is_like_special(c))
-      out += '\\';
-    out += c;
-  }
+}  // namespace
+}  // namespace mediidx::platform
+
+using namespace mediidx::platform;
+
+extern "C" int TAVODBEscapeString(char* destination, const char* source, size_t length) {
+  return no_throw(-1,
+                  [&] { return escape_literal({destination, 2 * length + 1}, source, length); });
 }
 
-/// The word of capital letters after "@TAVO:".
-std::string_view placeholder_name(std::string_view text) {
-  std::size_t length = 0;
-  while (length < text.size() && text[length] >= 'A' && text[length] <= 'Z')
-    ++length;
-  return text.substr(0, length);
+extern "C" int TAVODBEscapeStringEX2(int databaseType, char* destination, size_t size,
+                                     const char* source, size_t length) {
+  if (databaseType != TAVODB_TYPE_POSTGRESQL) return -1;
+  return no_throw(-1, [&] { return escape_literal({destination, size}, source, length); });
 }
 
-/// Appends the value of a placeholder, taken from the arguments; false when it
-/// has none.
-bool append_value(std::string &out, std::string_view name, va_list &arguments) {
-  if (name == "INT")
-    return out += std::to_string(va_arg(arguments, int)), true;
-  if (name == "LLINT")
-    return out += std::to_string(va_arg(arguments, long long)), true;
-  if (name != "VAR" && name != "LVAR" && name != "NEVAR")
-    return false;
-  const char *value = va_arg(arguments, const char *);
-  if (!value)
-    return false;
-  if (name == "VAR")
-    append_literal(out, value);
-  if (name == "LVAR")
-    append_pattern(out, value);
-  if (name == "NEVAR")
-    out += value;
-  return true;
+extern "C" int TAVODBEscapeBackslash(char* destination, size_t size, const char* source) {
+  return no_throw(-1, [&] { return escape_pattern({destination, size}, source); });
 }
 
-std::optional<std::string> fill(std::string_view sql, va_list &arguments) {
-  constexpr std::string_view kMark = "@TAVO:";
-  std::string out;
-  out.reserve(sql.size() * 2);
-  for (;;) {
-    const auto mark = sql.find(kMark);
-    out += sql.substr(0, mark);
-    if (mark == sql.npos)
-      return out;
-    sql.remove_prefix(mark + kMark.size());
-    const auto name = placeholder_name(sql);
-    if (!append_value(out, name, arguments))
-      return std::nullopt;
-    sql.remove_prefix(name.size());
-  }
+extern "C" int TAVODBEscapeBackslashEX2(int databaseType, char* destination, size_t size,
+                                        const char* source) {
+  if (databaseType != TAVODB_TYPE_POSTGRESQL) return -1;
+  return TAVODBEscapeBackslash(destination, size, source);
 }
 
-/// Copies with a terminator; -1 when it does not fit.
-int copy_out(const std::string &text, char *destination, std::size_t size) {
-  if (text.size() >= size)
-    return -1;
-  std::memcpy(destination, text.c_str(), text.size() + 1);
-  return 0;
-}
-
-bool is_known(int database_type) {
-  return database_type == TAVODB_TYPE_POSTGRESQL;
-}
-
-} // namespace
-
-extern "C" char *TAVODBEscapeStringEX3(int databaseType, const char *sql, ...) {
-  if (!is_known(databaseType) || !sql)
-    return nullptr;
-  va_list arguments;
-  va_start(arguments, sql);
-  char *text = tavodb::guarded(static_cast<char *>(nullptr), [&]() -> char * {
-    const auto filled = fill(sql, arguments);
-    return filled ? strdup(filled->c_str()) : nullptr;
-  });
-  va_end(arguments);
-  return text;
-}
-
-extern "C" int TAVODBEscapeString(char *destination, const char *source,
-                                  size_t length) {
-  return TAVODBEscapeStringEX2(TAVODB_TYPE_POSTGRESQL, destination,
-                               2 * length + 1, source, length);
-}
-
-extern "C" int TAVODBEscapeStringEX2(int databaseType, char *destination,
-                                     size_t size, const char *source,
-                                     size_t length) {
-  if (!is_known(databaseType) || !destination || !source)
-    return -1;
-  return tavodb::guarded(-1, [&] {
-    std::string out;
-    append_literal(out, {source, strnlen(source, length)});
-    return copy_out(out, destination, size);
-  });
-}
-
-extern "C" int TAVODBEscapeBackslash(char *destination, size_t size,
-                                     const char *source) {
-  return TAVODBEscapeBackslashEX2(TAVODB_TYPE_POSTGRESQL, destination, size,
-                                  source);
-}
-
-extern "C" int TAVODBEscapeBackslashEX2(int databaseType, char *destination,
-                                        size_t size, const char *source) {
-  if (!is_known(databaseType) || !destination || !source)
-    return -1;
-  return tavodb::guarded(-1, [&] {
-    std::string out;
-    for (const char *c = source; *c; ++c) {
-      if (is_like_special(*c))
-        out += '\\';
-      out += *c;
-    }
-    return copy_out(out, destination, size);
-  });
-}
-
-extern "C" int EscapeConditionEX(tavodb_connection *, const char *condition,
-                                 char *destination) {
-  if (!condition || !destination)
-    return -1;
-  return tavodb::guarded(-1, [&] {
-    const std::string_view text(condition);
-    const auto opening = text.find('\'');
-    const auto closing = text.rfind('\'');
-    // The value reaches from the first quote to the last; a lone quote opens
-    // one that never ends.
-    if (opening != text.npos && opening == closing)
-      return -1;
-    std::string out(
-        text.substr(0, opening == text.npos ? text.size() : opening + 1));
-    if (opening != text.npos) {
-      append_literal(out, text.substr(opening + 1, closing - opening - 1));
-      out += text.substr(closing);
-    }
-    return copy_out(out, destination, 2 * text.size() + 1);
+extern "C" int EscapeConditionEX(tavodb_connection*, const char* condition, char* destination) {
+  return no_throw(-1, [&] {
+    if (!condition || !destination) return -1;
+    const auto escaped = escape_condition(condition);
+    return escaped ? store({destination, 2 * std::strlen(condition) + 1}, *escaped) : -1;
   });
 }

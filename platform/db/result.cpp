@@ -1,69 +1,80 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
+#include "result.h"
+
 #include <algorithm>
-#include <cctype>
+#include <string>
 
 #include "border.h"
-#include "connection.h"
 
+namespace mediidx::platform {
 namespace {
 
-std::string folded(const char *name) {
+bool is_capital(char c) { return c >= 'A' && c <= 'Z'; }
+
+/// What the server makes of a name without quotes.
+std::string folded(std::string_view name) {
   std::string text(name);
-  std::ranges::transform(text, text.begin(), [](char c) {
-    return c >= 'A' && c <= 'Z' ? static_cast<char>(c - 'A' + 'a') : c;
-  });
+  for (char& c : text) {
+    if (is_capital(c)) c = static_cast<char>(c - 'A' + 'a');
+  }
   return text;
 }
 
-} // namespace
+}  // namespace
 
-tavodb_result::tavodb_result(tavodb::OwnedPgResult result)
-    : pg(std::move(result)) {
-  const int count = PQnfields(pg.get());
-  // emplace keeps the first of several columns with one name.
-  for (int i = 0; i < count; ++i)
-    columns_.emplace(folded(PQfname(pg.get(), i)), i);
-}
-
-int tavodb_result::column(const char *name) const {
-  const auto found = columns_.find(folded(name));
-  return found == columns_.end() ? -1 : found->second;
-}
-
-extern "C" int TAVODBNumRows(tavodb_result *result) {
-  return result ? PQntuples(result->pg.get()) : 0;
-}
-
-extern "C" int TAVODBFetchRow(tavodb_result *result, uint32_t *row) {
-  if (!result || !row ||
-      result->next >= static_cast<uint32_t>(TAVODBNumRows(result)))
-    return -1;
-  *row = ++result->next;
-  return 0;
-}
-
-extern "C" const char *TAVODBFetchField(tavodb_result *result, uint32_t row,
-                                        const char *column) {
-  if (!result || !column || row == 0 ||
-      row > static_cast<uint32_t>(TAVODBNumRows(result))) {
-    return nullptr;
+Result::Result(OwnedRows rows) : rows_(std::move(rows)) {
+  const int count = PQnfields(rows_.get());
+  columns_.reserve(static_cast<std::size_t>(count));
+  // Of several columns of one name the first keeps its place.
+  for (int column = 0; column < count; ++column) {
+    columns_.try_emplace(PQfname(rows_.get(), column), column);
   }
-  return tavodb::guarded(
-      static_cast<const char *>(nullptr), [&]() -> const char * {
-        const int number = result->column(column);
-        const int index = static_cast<int>(row - 1);
-        if (number < 0 || PQgetisnull(result->pg.get(), index, number))
-          return nullptr;
-        return PQgetvalue(result->pg.get(), index, number);
-      });
 }
 
-extern "C" int TAVODBSetRowCursor(tavodb_result *result, uint32_t rowNumber) {
-  if (!result || rowNumber >= static_cast<uint32_t>(TAVODBNumRows(result)))
-    return -1;
-  result->next = rowNumber;
+std::uint32_t Result::next() { return next_ < size() ? static_cast<std::uint32_t>(++next_) : 0; }
+
+bool Result::set_next(std::uint32_t row) {
+  if (row >= static_cast<std::uint32_t>(size())) return false;
+  next_ = static_cast<int>(row);
+  return true;
+}
+
+std::optional<int> Result::find(std::string_view column) const {
+  auto found = columns_.find(column);
+  if (found == columns_.end() && std::ranges::any_of(column, is_capital)) {
+    found = columns_.find(folded(column));
+  }
+  return found == columns_.end() ? std::nullopt : std::optional(found->second);
+}
+
+const char* Result::field(std::uint32_t cursor, std::string_view column) const {
+  if (cursor == 0 || cursor > static_cast<std::uint32_t>(size())) return nullptr;
+  const auto number = find(column);
+  const int row = static_cast<int>(cursor - 1);
+  if (!number || PQgetisnull(rows_.get(), row, *number)) return nullptr;
+  return PQgetvalue(rows_.get(), row, *number);
+}
+
+}  // namespace mediidx::platform
+
+extern "C" int TAVODBNumRows(tavodb_result* result) { return result ? result->size() : -1; }
+
+extern "C" int TAVODBFetchRow(tavodb_result* result, uint32_t* row) {
+  if (!result || !row) return -1;
+  const auto cursor = result->next();
+  if (cursor == 0) return -1;
+  *row = cursor;
   return 0;
 }
 
-extern "C" void TAVODBFreeResult(tavodb_result *result) { delete result; }
+extern "C" const char* TAVODBFetchField(tavodb_result* result, uint32_t row, const char* column) {
+  return mediidx::platform::no_throw<const char*>(
+      nullptr, [&] { return result && column ? result->field(row, column) : nullptr; });
+}
+
+extern "C" int TAVODBSetRowCursor(tavodb_result* result, uint32_t rowNumber) {
+  return result && result->set_next(rowNumber) ? 0 : -1;
+}
+
+extern "C" void TAVODBFreeResult(tavodb_result* result) { delete result; }

@@ -1,29 +1,21 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-/// A text of several SQL statements, one by one.
+/// Texts of several statements, taken apart where the server's own reader would end one.
 #ifndef TAVODB_STATEMENT_SPLITTER_H_
 #define TAVODB_STATEMENT_SPLITTER_H_
 
 #include <optional>
 #include <string_view>
 
-namespace tavodb {
+namespace mediidx::platform {
 
-/// Walks the statements of a text that outlives it. They are split at ";"
-/// outside of literals, quoted names and comments; those that hold nothing but
-/// white space and comments are passed over.
-class StatementSplitter {
-public:
-  explicit StatementSplitter(std::string_view text) : rest_(text) {}
+/// Takes the next statement off the front of `text`: up to a ";" outside of literals, quoted names
+/// and comments, without it and without blanks around. Pieces that hold nothing but blanks and
+/// comments are passed over; nothing when none is left. What is opened and never closed reaches to
+/// the end of the text, so that the server can complain of it.
+std::optional<std::string_view> next_statement(std::string_view& text);
 
-  /// The next statement, without its ";"; empty at the end.
-  std::optional<std::string_view> next();
-
-private:
-  std::string_view rest_;
-};
-
-} // namespace tavodb
+}  // namespace mediidx::platform
 
 #endif

@@ -31,7 +31,8 @@ TAVODB_EXPORT struct tavodb_connection* TAVODBConnect(const char* host, const ch
                                                       const char* password, const char* database);
 /// Closes the connection; null is ignored.
 TAVODB_EXPORT void TAVODBClose(struct tavodb_connection* conn);
-/// The text of the last error, never null; valid until the next call on the connection.
+/// The text of the last error, never null; valid until the next call on the connection. For a null
+/// connection, why this thread's last TAVODBConnect failed.
 TAVODB_EXPORT const char* TAVODBErrorGet(struct tavodb_connection* conn);
 /// The kind of database, to be passed to the escaping calls.
 TAVODB_EXPORT int TAVODBDatabaseTypeGet(struct tavodb_connection* conn);
@@ -44,7 +45,8 @@ TAVODB_EXPORT int TAVODBDatabaseTypeGet(struct tavodb_connection* conn);
 /// re-established once; a statement that may have reached the server is never sent again.
 TAVODB_EXPORT int TAVODBExecute(struct tavodb_connection* conn, const char* sql,
                                 struct tavodb_result** result);
-/// Runs one SELECT for at most `limit` rows after the first `offset`; a limit of 0 means all.
+/// Runs one SELECT for at most `limit` rows after the first `offset`; a limit of 0 means all. With
+/// both 0 the text is run as it is.
 TAVODB_EXPORT int TAVODBSelectLimit(struct tavodb_connection* conn, const char* sql, uint32_t limit,
                                     uint32_t offset, struct tavodb_result** result);
 /// Rows touched by the connection's last statement. `result` is not looked at and may be freed.
@@ -56,7 +58,8 @@ TAVODB_EXPORT int TAVODBNumRows(struct tavodb_result* result);
 /// Moves to the next row and stores its cursor (never 0) for TAVODBFetchField; -1 after the last.
 TAVODB_EXPORT int TAVODBFetchRow(struct tavodb_result* result, uint32_t* row);
 /// The text of a column of a fetched row, valid until the result is freed; null when the column is
-/// absent or SQL null. Of several columns with one name the first counts.
+/// absent or SQL null. Of several columns with one name the first counts. A name that no column has
+/// is looked up in small letters too, which is how the server names a column without quotes.
 TAVODB_EXPORT const char* TAVODBFetchField(struct tavodb_result* result, uint32_t row,
                                            const char* column);
 /// Makes the next fetch return the row of this number, counted from 0; -1 when there is none.
@@ -86,7 +89,9 @@ TAVODB_EXPORT int TAVODBEscapeBackslash(char* destination, size_t size, const ch
 TAVODB_EXPORT int TAVODBEscapeBackslashEX2(int databaseType, char* destination, size_t size,
                                            const char* source);
 /// Escapes the values within a condition of the form " column='value' " so that it stays one
-/// comparison with one literal, whatever the value holds. `destination` holds 2 x length + 1 bytes.
+/// comparison with one literal, whatever the value holds: the value reaches from the first quote to
+/// the last. -1 for a single quote, which ends no value; without quotes the text is copied.
+/// `destination` holds 2 x length + 1 bytes.
 TAVODB_EXPORT int EscapeConditionEX(struct tavodb_connection* conn, const char* condition,
                                     char* destination);
 

@@ -48,7 +48,8 @@ int is_index_path(const char* path, MEDIA_TABLE_TYPE type) {
 int is_share_indexed(const char* share) {
   if (*share == '/') return IndexFolderIsCoveredByShare(share) > 0 ? 1 : 0;
   OwnedShare found;
-  if (TAVOShareGet(share, out(found)) != 0 || !found || !*found->path) return 0;
+  const int result = TAVOShareGet(share, out(found));
+  if (result != 0 || !found || !*found->path) return 0;
   return IndexFolderIsCoveredByShare(found->path) > 0 ? 1 : 0;
 }
 

@@ -79,7 +79,8 @@ int write_default_conf() {
   struct stat status{};
   for (const auto& [kind, link] : kDefaultShares) {
     OwnedShare share;
-    if (TAVOShareGet(kind, out(share)) == 0 && share) folder = appendPath(share->path, kind);
+    const int result = TAVOShareGet(kind, out(share));
+    if (result == 0 && share) folder = appendPath(share->path, kind);
     struct stat found;
     const bool exists = stat(folder.c_str(), &found) == 0;
     if (exists) status = found;

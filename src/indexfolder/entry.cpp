@@ -59,13 +59,14 @@ std::string_view flag_of_kind(int kind) {
     case MEDIA_TABLE_PHOTO:
       return "photo";
     default:
-      return {};
+      return "";
   }
 }
 
 std::optional<std::string> absolute_folder(const std::string& path) {
   OwnedShare share;
-  if (TAVOShareGet(getShareName(path).c_str(), out(share)) != 0 || !share) return std::nullopt;
+  const int result = TAVOShareGet(getShareName(path).c_str(), out(share));
+  if (result != 0 || !share) return std::nullopt;
   return appendPath(share->path, getFolderPath(path));
 }
 

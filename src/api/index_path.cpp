@@ -10,6 +10,7 @@
 #include "support/log.h"
 #include "support/no_throw.h"
 #include "support/owned.h"
+#include "support/share.h"
 
 namespace mediidx {
 namespace {
@@ -47,9 +48,8 @@ int is_index_path(const char* path, MEDIA_TABLE_TYPE type) {
 /// A share by its folder, or by its name, which never begins with a slash.
 int is_share_indexed(const char* share) {
   if (*share == '/') return IndexFolderIsCoveredByShare(share) > 0 ? 1 : 0;
-  OwnedShare found;
-  const int result = TAVOShareGet(share, out(found));
-  if (result != 0 || !found || !*found->path) return 0;
+  const auto found = find_share(share);
+  if (!found || !*found->path) return 0;
   return IndexFolderIsCoveredByShare(found->path) > 0 ? 1 : 0;
 }
 

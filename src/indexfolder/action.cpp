@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <sys/stat.h>
 #include <tavocore.h>
-#include <tavosdk.h>
 #include <unistd.h>
 
 #include <string>
@@ -11,8 +10,8 @@
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
 #include "support/log.h"
-#include "support/owned.h"
 #include "support/root.h"
+#include "support/share.h"
 
 namespace mediidx {
 namespace {
@@ -154,8 +153,8 @@ void SetShareIndexed(tlib_szlist* shares, bool on) {
   if (!shares) return;
   const int count = TLIBCSzListCount(shares);
   for (int i = 0; i < count; ++i) {
-    mediidx::OwnedShare share;
-    if (TAVOShareGet(TLIBCSzListGet(shares, i), mediidx::out(share)) < 0 || !share) {
+    const auto share = mediidx::find_share(TLIBCSzListGet(shares, i));
+    if (!share) {
       kIndexFolderActionLog.colon(503, "TAVOShareGet failed [%X]",
                                   static_cast<unsigned>(TLIBCErrGet()));
       return;

@@ -14,8 +14,8 @@
 #include "mediidx/index_folder.h"
 #include "support/log.h"
 #include "support/no_throw.h"
-#include "support/owned.h"
 #include "support/root.h"
+#include "support/share.h"
 
 namespace mediidx {
 namespace {
@@ -78,9 +78,8 @@ int write_default_conf() {
   std::string folder;
   struct stat status{};
   for (const auto& [kind, link] : kDefaultShares) {
-    OwnedShare share;
-    const int result = TAVOShareGet(kind, out(share));
-    if (result == 0 && share) folder = appendPath(share->path, kind);
+    const auto share = find_share(kind);
+    if (share) folder = appendPath(share->path, kind);
     struct stat found;
     const bool exists = stat(folder.c_str(), &found) == 0;
     if (exists) status = found;

@@ -13,7 +13,7 @@
 #include "mediidx/index_folder_action.h"
 #include "support/log.h"
 #include "support/no_throw.h"
-#include "support/owned.h"
+#include "support/share.h"
 
 namespace mediidx {
 namespace {
@@ -30,8 +30,8 @@ FileForm read_file_form() {
     if (!is_usable_entry(entry)) continue;
     const auto path = entry["path"].asString();
     const auto name = getShareName(path);
-    OwnedShare share;
-    if (TAVOShareGet(name.c_str(), out(share)) != 0 || !share) continue;
+    const auto share = find_share(name.c_str());
+    if (!share) continue;
     form.path_by_folder[appendPath(share->path, getFolderPath(path))] = path;
     form.folder_by_share[name] = share->path;
   }

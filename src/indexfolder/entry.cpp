@@ -5,7 +5,7 @@
 #include <array>
 
 #include "mediidx/index_folder.h"
-#include "support/owned.h"
+#include "support/share.h"
 
 namespace mediidx {
 namespace {
@@ -64,9 +64,8 @@ std::string_view flag_of_kind(int kind) {
 }
 
 std::optional<std::string> absolute_folder(const std::string& path) {
-  OwnedShare share;
-  const int result = TAVOShareGet(getShareName(path).c_str(), out(share));
-  if (result != 0 || !share) return std::nullopt;
+  const auto share = find_share(getShareName(path).c_str());
+  if (!share) return std::nullopt;
   return appendPath(share->path, getFolderPath(path));
 }
 

@@ -37,7 +37,8 @@ using OwnedShare = Owned<TAVOSHARE, TAVOShareFree>;
 using OwnedUser = Owned<TAVOUSER, TAVOUserFree>;
 using OwnedHomeCheck = Owned<TAVOHOMECHECK, TAVOHomeCheckResultFree>;
 
-/// Lends an empty owner to a C call that fills a pointer: `Get(name, out(share))`.
+/// Lends an empty owner to a C call that fills a pointer: `Get(name, out(share))`. The owner holds
+/// what came at the end of the whole expression, so it must not be looked at within it.
 template <class Owner>
 class Out {
  public:

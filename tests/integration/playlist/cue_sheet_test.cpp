@@ -145,8 +145,8 @@ TEST_F(CueFile, IsReadUpToALineThatIsTooLong) {
   std::filesystem::remove(root.at("usr/bin/php"));
   const auto head = sheet_with_title("One");
   const auto tail = std::string("TRACK 02 AUDIO\nINDEX 01 01:00:00\n");
-  EXPECT_EQ(read(write_sheet(head + "REM " + std::string(1018, 'x') + "\n" + tail)).size(), 2U);
-  EXPECT_EQ(read(write_sheet(head + "REM " + std::string(1019, 'x') + "\n" + tail)).size(), 1U);
+  EXPECT_EQ(read(write_sheet(head + "REM " + std::string(1019, 'x') + "\n" + tail)).size(), 2U);
+  EXPECT_EQ(read(write_sheet(head + "REM " + std::string(1020, 'x') + "\n" + tail)).size(), 1U);
   EXPECT_EQ(result, 0);
 }
 

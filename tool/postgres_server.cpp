@@ -235,8 +235,8 @@ void PostgresServer::stop() {
   if (!now) return;
   kill(now->pid, SIGINT);  // "fast": open sessions are ended, nothing is lost
   const auto limit = std::chrono::steady_clock::now() + kStopLimit;
-  while (serves_cluster(now->pid)) {
-    if (child_ == now->pid && waitpid(child_, nullptr, WNOHANG) == child_) break;
+  // Init takes the server of another mediidx from the table; until then it has no folder any more.
+  while (child_ == now->pid ? waitpid(child_, nullptr, WNOHANG) == 0 : serves_cluster(now->pid)) {
     if (std::chrono::steady_clock::now() > limit) {
       throw std::runtime_error("the database server did not stop; see " + log_.string());
     }

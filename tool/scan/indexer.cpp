@@ -64,6 +64,7 @@ bool Indexer::asks_to_stop(const std::string& path) {
 }
 
 void Indexer::add_folder(const std::string& path) {
+  if (TAVOMediaIndexIsIndexPath(path.c_str(), MEDIA_TABLE_DIRECTORY) <= 0) return;
   const auto record = folder_record(path);
   if (TAVOMediaIndexDirAdd(record.get()) == 0) {
     ++report_.folders;

@@ -1,18 +1,12 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
-#include <unistd.h>
-
 #include <array>
-#include <charconv>
-#include <cmath>
-#include <cstdio>
 #include <span>
 
-#include "cli/output.h"
+#include "cli/row_output.h"
 #include "cli/verbs.h"
 #include "store/data_folder.h"
 #include "store/database.h"
-#include "text/table.h"
 
 namespace mediidx::tool {
 namespace {
@@ -74,81 +68,72 @@ constexpr const char* kSelectFolders =
     "SELECT title, mdate, fs_uuid, userid, path FROM personal_directory "
     "ORDER BY path";
 
-enum class Type { kText, kPath, kNumber, kSeconds, kYesNo };
-
-/// A column of a query: its name, also in JSON, and its title in a table (null: in JSON only).
-struct ListColumn {
-  const char* name;
-  const char* title;
-  Type type;
+constexpr RowColumn kMusicColumns[] = {
+    {"title", "Title", ValueType::kText},       {"artist", "Artist", ValueType::kText},
+    {"album", "Album", ValueType::kText},       {"album_artist", nullptr, ValueType::kText},
+    {"genre", nullptr, ValueType::kText},       {"year", "Year", ValueType::kNumber},
+    {"disc", nullptr, ValueType::kNumber},      {"track", "No.", ValueType::kNumber},
+    {"duration", "Time", ValueType::kSeconds},  {"codec", nullptr, ValueType::kText},
+    {"container", nullptr, ValueType::kText},   {"bitrate", nullptr, ValueType::kNumber},
+    {"frequency", nullptr, ValueType::kNumber}, {"channel", nullptr, ValueType::kNumber},
+    {"filesize", nullptr, ValueType::kNumber},  {"virtual", nullptr, ValueType::kYesNo},
+    {"userid", nullptr, ValueType::kNumber},    {"path", "Path", ValueType::kPath},
 };
-
-constexpr ListColumn kMusicColumns[] = {
-    {"title", "Title", Type::kText},       {"artist", "Artist", Type::kText},
-    {"album", "Album", Type::kText},       {"album_artist", nullptr, Type::kText},
-    {"genre", nullptr, Type::kText},       {"year", "Year", Type::kNumber},
-    {"disc", nullptr, Type::kNumber},      {"track", "No.", Type::kNumber},
-    {"duration", "Time", Type::kSeconds},  {"codec", nullptr, Type::kText},
-    {"container", nullptr, Type::kText},   {"bitrate", nullptr, Type::kNumber},
-    {"frequency", nullptr, Type::kNumber}, {"channel", nullptr, Type::kNumber},
-    {"filesize", nullptr, Type::kNumber},  {"virtual", nullptr, Type::kYesNo},
-    {"userid", nullptr, Type::kNumber},    {"path", "Path", Type::kPath},
+constexpr RowColumn kAlbumColumns[] = {
+    {"album", "Album", ValueType::kText},      {"album_artist", "Album artist", ValueType::kText},
+    {"year", "Year", ValueType::kNumber},      {"tracks", "Tracks", ValueType::kNumber},
+    {"duration", "Time", ValueType::kSeconds},
 };
-constexpr ListColumn kAlbumColumns[] = {
-    {"album", "Album", Type::kText},      {"album_artist", "Album artist", Type::kText},
-    {"year", "Year", Type::kNumber},      {"tracks", "Tracks", Type::kNumber},
-    {"duration", "Time", Type::kSeconds},
+constexpr RowColumn kArtistColumns[] = {
+    {"artist", "Artist", ValueType::kText},
+    {"albums", "Albums", ValueType::kNumber},
+    {"tracks", "Tracks", ValueType::kNumber},
 };
-constexpr ListColumn kArtistColumns[] = {
-    {"artist", "Artist", Type::kText},
-    {"albums", "Albums", Type::kNumber},
-    {"tracks", "Tracks", Type::kNumber},
+constexpr RowColumn kGenreColumns[] = {
+    {"genre", "Genre", ValueType::kText},
+    {"tracks", "Tracks", ValueType::kNumber},
 };
-constexpr ListColumn kGenreColumns[] = {
-    {"genre", "Genre", Type::kText},
-    {"tracks", "Tracks", Type::kNumber},
+constexpr RowColumn kPhotoColumns[] = {
+    {"title", "Title", ValueType::kText},
+    {"album", "Album", ValueType::kText},
+    {"timetaken", "Taken", ValueType::kText},
+    {"resolutionx", "Width", ValueType::kNumber},
+    {"resolutiony", "Height", ValueType::kNumber},
+    {"camera", "Camera", ValueType::kText},
+    {"exposure", nullptr, ValueType::kText},
+    {"aperture", nullptr, ValueType::kText},
+    {"iso", nullptr, ValueType::kNumber},
+    {"filesize", nullptr, ValueType::kNumber},
+    {"path", "Path", ValueType::kPath},
 };
-constexpr ListColumn kPhotoColumns[] = {
-    {"title", "Title", Type::kText},
-    {"album", "Album", Type::kText},
-    {"timetaken", "Taken", Type::kText},
-    {"resolutionx", "Width", Type::kNumber},
-    {"resolutiony", "Height", Type::kNumber},
-    {"camera", "Camera", Type::kText},
-    {"exposure", nullptr, Type::kText},
-    {"aperture", nullptr, Type::kText},
-    {"iso", nullptr, Type::kNumber},
-    {"filesize", nullptr, Type::kNumber},
-    {"path", "Path", Type::kPath},
+constexpr RowColumn kVideoColumns[] = {
+    {"title", "Title", ValueType::kText},
+    {"album", nullptr, ValueType::kText},
+    {"duration", "Time", ValueType::kSeconds},
+    {"resolutionx", "Width", ValueType::kNumber},
+    {"resolutiony", "Height", ValueType::kNumber},
+    {"video_codec", "Video", ValueType::kText},
+    {"audio_codec", "Audio", ValueType::kText},
+    {"container_type", nullptr, ValueType::kText},
+    {"frame_bitrate", nullptr, ValueType::kNumber},
+    {"filesize", nullptr, ValueType::kNumber},
+    {"path", "Path", ValueType::kPath},
 };
-constexpr ListColumn kVideoColumns[] = {
-    {"title", "Title", Type::kText},
-    {"album", nullptr, Type::kText},
-    {"duration", "Time", Type::kSeconds},
-    {"resolutionx", "Width", Type::kNumber},
-    {"resolutiony", "Height", Type::kNumber},
-    {"video_codec", "Video", Type::kText},
-    {"audio_codec", "Audio", Type::kText},
-    {"container_type", nullptr, Type::kText},
-    {"frame_bitrate", nullptr, Type::kNumber},
-    {"filesize", nullptr, Type::kNumber},
-    {"path", "Path", Type::kPath},
+constexpr RowColumn kPlaylistColumns[] = {
+    {"title", "Title", ValueType::kText},      {"song_count", "Songs", ValueType::kNumber},
+    {"filesize", nullptr, ValueType::kNumber}, {"userid", nullptr, ValueType::kNumber},
+    {"path", "Path", ValueType::kPath},
 };
-constexpr ListColumn kPlaylistColumns[] = {
-    {"title", "Title", Type::kText},      {"song_count", "Songs", Type::kNumber},
-    {"filesize", nullptr, Type::kNumber}, {"userid", nullptr, Type::kNumber},
-    {"path", "Path", Type::kPath},
-};
-constexpr ListColumn kFolderColumns[] = {
-    {"title", nullptr, Type::kText},   {"mdate", "Changed", Type::kText},
-    {"fs_uuid", nullptr, Type::kText}, {"userid", nullptr, Type::kNumber},
-    {"path", "Path", Type::kPath},
+constexpr RowColumn kFolderColumns[] = {
+    {"title", nullptr, ValueType::kText},   {"mdate", "Changed", ValueType::kText},
+    {"fs_uuid", nullptr, ValueType::kText}, {"userid", nullptr, ValueType::kNumber},
+    {"path", "Path", ValueType::kPath},
 };
 
 struct List {
   const char* name;
   const char* query;
-  std::span<const ListColumn> columns;
+  std::span<const RowColumn> columns;
 };
 
 constexpr List kLists[] = {
@@ -168,69 +153,6 @@ constexpr auto kChoices = [] {
   return names;
 }();
 
-double number_of(const std::string& text) {
-  double value = 0;
-  std::from_chars(text.data(), text.data() + text.size(), value);
-  return std::isfinite(value) ? value : 0;
-}
-
-/// "3:05", "1:02:03"
-std::string clock_text(double seconds) {
-  const auto whole = static_cast<long>(seconds);
-  std::array<char, 48> text;
-  if (whole < 3600) {
-    std::snprintf(text.data(), text.size(), "%ld:%02ld", whole / 60, whole % 60);
-  } else {
-    std::snprintf(text.data(), text.size(), "%ld:%02ld:%02ld", whole / 3600, whole / 60 % 60,
-                  whole % 60);
-  }
-  return text.data();
-}
-
-std::string cell_text(const Rows& rows, const ListColumn& column) {
-  const auto text = rows.text(column.name);
-  if (column.type == Type::kNumber) return text == "0" ? "" : text;
-  if (column.type == Type::kSeconds) return text.empty() ? "" : clock_text(number_of(text));
-  return text;
-}
-
-Json::Value json_value(const Rows& rows, const ListColumn& column) {
-  const auto text = rows.text(column.name);
-  if (column.type == Type::kNumber) return Json::Int64{std::llround(number_of(text))};
-  if (column.type == Type::kSeconds) return number_of(text);
-  if (column.type == Type::kYesNo) return text == "t";
-  return text;
-}
-
-void print_json(Rows rows, const List& list) {
-  JsonList out;
-  while (rows.next()) {
-    Json::Value object(Json::objectValue);
-    for (const auto& column : list.columns) object[column.name] = json_value(rows, column);
-    out.add(object);
-  }
-  out.finish();
-}
-
-void print_table(Rows rows, const List& list) {
-  std::vector<Column> columns;
-  for (const auto& column : list.columns) {
-    if (!column.title) continue;
-    const bool is_number = column.type == Type::kNumber || column.type == Type::kSeconds;
-    columns.push_back({column.title, is_number, column.type == Type::kPath});
-  }
-  std::vector<TableRow> lines;
-  while (rows.next()) {
-    TableRow line;
-    for (const auto& column : list.columns) {
-      if (column.title) line.push_back(cell_text(rows, column));
-    }
-    lines.push_back(std::move(line));
-  }
-  const int width = terminal_width(STDOUT_FILENO);
-  put(width > 0 ? format_table(columns, lines, width) : format_lines(lines));
-}
-
 }  // namespace
 
 std::span<const char* const> list_choices() { return kChoices; }
@@ -240,12 +162,7 @@ int run_list(const Arguments& arguments) {
   Database database(folder);
   for (const auto& list : kLists) {
     if (arguments.operands[0] != list.name) continue;
-    auto rows = database.query(list.query);
-    if (arguments.has("--json")) {
-      print_json(std::move(rows), list);
-    } else {
-      print_table(std::move(rows), list);
-    }
+    print_rows(database.query(list.query), list.columns, arguments.has("--json"));
   }
   return kExitDone;
 }

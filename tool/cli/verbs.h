@@ -31,7 +31,18 @@ int run_command(const std::vector<std::string>& words);
 
 int run_index(const Arguments& arguments);
 int run_list(const Arguments& arguments);
+int run_show(const Arguments& arguments);
+int run_search(const Arguments& arguments);
+int run_stats(const Arguments& arguments);
+int run_playlist_show(const Arguments& arguments);
+int run_cue_show(const Arguments& arguments);
+int run_volume_offline(const Arguments& arguments);
+int run_volume_online(const Arguments& arguments);
+int run_volume_purge(const Arguments& arguments);
 int run_db_init(const Arguments& arguments);
+int run_db_vacuum(const Arguments& arguments);
+int run_db_reset(const Arguments& arguments);
+int run_db_shell(const Arguments& arguments);
 
 /// The things that "list" knows.
 std::span<const char* const> list_choices();

@@ -15,6 +15,7 @@
 #include <system_error>
 
 #include "mediidx/root.h"
+#include "store/root.h"
 
 namespace mediidx::tool {
 namespace {
@@ -77,6 +78,7 @@ DataFolder::DataFolder(const std::optional<std::string>& asked)
   if (TAVOMediaIndexRootSet(root().c_str()) != 0 || TAVOPlatformRootSet(root().c_str()) != 0) {
     throw std::runtime_error("the data folder's name is too long: " + path_.string());
   }
+  set_own_root(root().string());
 }
 
 void DataFolder::make_root() const {

@@ -123,15 +123,14 @@ TEST_F(OpeningABatch, LosesNothingWhereItsFirstBufferEnds) {
         MediaInfoDBBatchOpen(MEDIA_TABLE_PHOTO, nullptr, "path", two.get(), nullptr, nullptr, 0, 0),
         MediaInfoDBBatchClose);
     EXPECT_THAT(paths(handle.get()), ElementsAre("/b"));
-    EXPECT_EQ(sent_statements().back(),
-              "SELECT * FROM photo WHERE path in ('" + path + "','/b')  ");
+    EXPECT_EQ(last_statement(), "SELECT * FROM photo WHERE path in ('" + path + "','/b')  ");
   }
 }
 
 TEST_F(OpeningABatch, FailsWithoutCandidates) {
   EXPECT_EQ(open_batch(), nullptr);
   EXPECT_EQ(
-      log_lines().back(),
+      last_log_line(),
       parens("MediaInfoDBOpenEx(2, (null), path in (), (null), (null), 0, 0, 0, TRUE) failed"));
 }
 

@@ -156,7 +156,7 @@ TEST_F(DeletingMusic, FailsFirstWhenAlbumsCannotBeUpdated) {
   insert(kTargets[0], "/a");
   take_away("album_track");
   EXPECT_EQ(MediaInfoDBDelete(MEDIA_TABLE_MUSIC, "/a"), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to update album_track table"));
+  EXPECT_EQ(last_log_line(), colon("Failed to update album_track table"));
   EXPECT_EQ(count("music"), 1);
 }
 
@@ -179,7 +179,7 @@ TEST_F(DeletingAPlaylist, FailsFirstWhenVirtualTracksCannotBeDeleted) {
   insert(kTargets[4], "/a.cue");
   take_away("virtual_music");
   EXPECT_EQ(MediaInfoDBDelete(MEDIA_TABLE_PLAYLIST, "/a.cue"), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to delete virtual files"));
+  EXPECT_EQ(last_log_line(), colon("Failed to delete virtual files"));
   EXPECT_EQ(count("playlist"), 1);
 }
 

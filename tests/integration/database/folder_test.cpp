@@ -90,14 +90,14 @@ TEST_F(SavingAFolder, FailsWithoutAConnection) {
 TEST_F(SavingAFolder, LogsAFailedStatement) {
   rows("ALTER TABLE directory DROP COLUMN title");
   EXPECT_EQ(save(folder("/d")), -1);
-  EXPECT_THAT(log_lines(), ElementsAre(failed_statement(sent_statements().back())));
+  EXPECT_THAT(log_lines(), ElementsAre(failed_statement(last_statement())));
 }
 
 TEST_F(SavingAFolder, LogsAFailedPersonalStatement) {
   const auto path = personal("d");
   rows("ALTER TABLE personal_directory DROP COLUMN title");
   EXPECT_EQ(save(folder(path)), -1);
-  EXPECT_THAT(log_lines(), ElementsAre(failed_statement(sent_statements().back())));
+  EXPECT_THAT(log_lines(), ElementsAre(failed_statement(last_statement())));
 }
 
 TEST_F(SavingAFolder, FailsWhenItsStatementCannotBeBuilt) {

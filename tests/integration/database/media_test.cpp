@@ -28,6 +28,16 @@ std::vector<std::string> log_lines() {
   return lines;
 }
 
+std::string last_log_line() {
+  const auto lines = log_lines();
+  return lines.empty() ? "" : lines.back();
+}
+
+std::string last_statement() {
+  const auto& statements = sent_statements();
+  return statements.empty() ? "" : statements.back();
+}
+
 std::string parens(const std::string& message) { return "mediidx_database (N) " + message; }
 std::string colon(const std::string& message) { return "mediidx_database:N " + message; }
 

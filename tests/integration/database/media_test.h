@@ -38,6 +38,10 @@ DIR_INFO_REC folder(std::string_view path);
 /// Logged lines with the number that a message carries as "N": "mediidx_database (N) Bad
 /// parameter".
 std::vector<std::string> log_lines();
+/// The last of them; empty when nothing was logged.
+std::string last_log_line();
+/// The text that was sent last; empty when none was.
+std::string last_statement();
 /// Such a line as the database module logs it, in its two shapes.
 std::string parens(const std::string& message);
 std::string colon(const std::string& message);

@@ -80,16 +80,16 @@ TEST_P(SavingAKind, FailsWithoutAConnection) {
   const auto path = shared("x");
   const NoServer no_server;
   EXPECT_EQ(save(GetParam().type, record(path)), -1);
-  EXPECT_EQ(log_lines().back(), parens("Failed to connect to database"));
+  EXPECT_EQ(last_log_line(), parens("Failed to connect to database"));
 }
 
 TEST_P(SavingAKind, LogsAFailedStatement) {
   const auto path = shared("x");
   take_away(table());
   EXPECT_EQ(save(GetParam().type, record(path)), -1);
-  EXPECT_THAT(log_lines().back(),
+  EXPECT_THAT(last_log_line(),
               StartsWith(parens("Failed to exec [INSERT INTO " + table() + "(path, ")));
-  EXPECT_THAT(log_lines().back(), EndsWith(std::string("] (") + TAVODBErrorGet(gpDBConnect) + ")"));
+  EXPECT_THAT(last_log_line(), EndsWith(std::string("] (") + TAVODBErrorGet(gpDBConnect) + ")"));
 }
 
 #ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
@@ -105,7 +105,7 @@ TEST_P(SavingAKind, GoesOnWithoutMemoryForTheDeleteBeforeIt) {
   const auto path = shared("x");
   const FailingAllocation allocation(Allocator::kCalloc, sizeof(MEDIA_DB_HANDLE));
   EXPECT_EQ(save(GetParam().type, record(path)), 0);
-  EXPECT_EQ(log_lines().front(), parens("Failed to malloc"));
+  EXPECT_THAT(log_lines(), testing::Contains(parens("Failed to malloc")));
 }
 #endif
 
@@ -278,7 +278,7 @@ TEST_F(SavingAFile, FailsWhenTheCatalogueDoes) {
   const auto path = shared("m.mp3");
   take_away("composer_track");
   EXPECT_EQ(save(MEDIA_TABLE_MUSIC, record(path)), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to insert data into track related tables"));
+  EXPECT_EQ(last_log_line(), colon("Failed to insert data into track related tables"));
   EXPECT_EQ(count("music"), 0);
 }
 
@@ -436,7 +436,7 @@ TEST_F(SavingReplayGain, FailsWithoutAConnection) {
 
 TEST_F(SavingReplayGain, FailsForATrackThatIsNotThere) {
   EXPECT_EQ(MediaInfoAudioRGMetadataDBSave(gains, 42), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to insert data into replaygain_track table"));
+  EXPECT_EQ(last_log_line(), colon("Failed to insert data into replaygain_track table"));
 }
 
 }  // namespace

@@ -18,7 +18,7 @@ class StatementOfASave : public MediaTest, public testing::WithParamInterface<Sa
 TEST_P(StatementOfASave, IsFilledToTheLetter) {
   auto info = record("/p");
   ASSERT_EQ(MediaInfoDBSave(GetParam().type, &info), 0);
-  EXPECT_EQ(sent_statements().back(), GetParam().statement);
+  EXPECT_EQ(last_statement(), GetParam().statement);
 }
 
 INSTANTIATE_TEST_SUITE_P(
@@ -72,7 +72,7 @@ TEST_F(Statement, OfAKnownFolderIsFilledToTheLetter) {
   rows("INSERT INTO directory(path) VALUES('/p')");
   const auto dir = folder("/p");
   ASSERT_EQ(DirInfoDBSave(&dir), 0);
-  EXPECT_EQ(sent_statements().back(),
+  EXPECT_EQ(last_statement(),
             "UPDATE directory SET title = '', date = 'epoch', mdate = 'epoch', "
             "fs_uuid = '' WHERE path = '/p'");
 }
@@ -84,7 +84,7 @@ TEST_P(StatementOfAnUpdate, IsFilledToTheLetter) {
   auto info = record("/p");
   info.id = 7;
   ASSERT_EQ(MediaInfoDBUpdate(GetParam().type, &info), 0);
-  EXPECT_EQ(sent_statements().back(), GetParam().statement);
+  EXPECT_EQ(last_statement(), GetParam().statement);
 }
 
 INSTANTIATE_TEST_SUITE_P(
@@ -118,7 +118,7 @@ class StatementOfADelete : public MediaTest, public testing::WithParamInterface<
 
 TEST_P(StatementOfADelete, IsFilledToTheLetter) {
   ASSERT_EQ(MediaInfoDBDelete(GetParam().type, "/100%"), 0);
-  EXPECT_EQ(sent_statements().back(), GetParam().statement);
+  EXPECT_EQ(last_statement(), GetParam().statement);
 }
 
 INSTANTIATE_TEST_SUITE_P(

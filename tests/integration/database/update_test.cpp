@@ -150,7 +150,7 @@ TEST_P(UpdatingWithTheLongestValues, CutsNothingOff) {
   info.duration = -1e20F;
   clear_sent_statements();
   ASSERT_EQ(MediaInfoDBUpdate(GetParam(), &info), 0);
-  EXPECT_THAT(sent_statements().back(), StartsWith("UPDATE " + table + " set "));
+  EXPECT_THAT(last_statement(), StartsWith("UPDATE " + table + " set "));
   EXPECT_EQ(value("SELECT title FROM " + table), info.title);
   EXPECT_EQ(value("SELECT filesize FROM " + table), std::to_string(LLONG_MIN));
   EXPECT_EQ(value("SELECT path FROM " + table), info.path);

@@ -144,7 +144,7 @@ TEST_F(SavingVirtualTracks, FailsWhenTheCatalogueDoes) {
   add(shared("m.flac"), "00:00:00", 1);
   take_away("virtual_info_track");
   EXPECT_EQ(save(), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to insert data into track related tables"));
+  EXPECT_EQ(last_log_line(), colon("Failed to insert data into track related tables"));
 }
 
 class DeletingVirtualTracks : public VirtualTracks {};
@@ -197,14 +197,14 @@ TEST_F(DeletingVirtualTracks, FailsWithoutAConnection) {
 TEST_F(DeletingVirtualTracks, FailsWhenAlbumsCannotBeUpdated) {
   take_away("album_track");
   EXPECT_EQ(MediaInfoVirtualDBDelete("/a.cue"), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to update album_track table"));
+  EXPECT_EQ(last_log_line(), colon("Failed to update album_track table"));
 }
 
 TEST_F(DeletingVirtualTracks, LogsAFailedStatement) {
   take_away("virtual_music");
   EXPECT_EQ(MediaInfoVirtualDBDelete("/a.cue"), -1);
-  EXPECT_EQ(log_lines().back(), colon("Failed to exec [" + sent_statements().back() + "] (" +
-                                      TAVODBErrorGet(gpDBConnect) + ")"));
+  EXPECT_EQ(last_log_line(), colon("Failed to exec [" + last_statement() + "] (" +
+                                   TAVODBErrorGet(gpDBConnect) + ")"));
 }
 
 }  // namespace

@@ -13,8 +13,16 @@
 namespace mediidx {
 namespace {
 
+std::string_view trimmed(std::string_view text) {
+  constexpr std::string_view kBlanks = " \t\r\n";
+  const auto first = text.find_first_not_of(kBlanks);
+  if (first == std::string_view::npos) return {};
+  return text.substr(first, text.find_last_not_of(kBlanks) - first + 1);
+}
+
 /// Independent of the process's locale; 0 for a text that is not wholly a decimal number.
 double parse_decimal(std::string_view text) {
+  text = trimmed(text);
   if (text.starts_with('+') && !text.starts_with("+-")) text.remove_prefix(1);
   double value = 0;
   const char* end = text.data() + text.size();

@@ -74,6 +74,46 @@ struct Connection {
   PGconn* conn;
 };
 
+/// Waits until they have ended.
+constexpr const char* kEndSessions =
+    "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity WHERE datname = 'mediaserver'";
+
+/// Everything of a database but the rows of its tables, as one text.
+constexpr const char* kFingerprint =
+    "SELECT md5(concat("
+    "(SELECT string_agg(concat(c.relname, c.relkind, a.attname, a.atttypid, a.attnotnull), ',' "
+    "ORDER BY c.relname, a.attnum) FROM pg_class c JOIN pg_attribute a ON a.attrelid = c.oid "
+    "WHERE c.relnamespace IN ('public'::regnamespace, 'mediidx'::regnamespace)), "
+    "(SELECT count(*) FROM pg_trigger), (SELECT count(*) FROM pg_rules), "
+    "(SELECT count(*) FROM pg_proc), (SELECT count(*) FROM pg_constraint), "
+    "(SELECT count(*) FROM pg_namespace), (SELECT count(*) FROM pg_db_role_setting), "
+    "(SELECT string_agg(version::text, ',') FROM mediidx.schema_version)))";
+
+/// Deleted rows stay on disk until a database is made anew.
+constexpr long kLargestReused = 24'000'000;
+
+constexpr const char* kDeleteRows =
+    "DO $$ DECLARE name text; BEGIN "
+    "FOR name IN SELECT tablename FROM pg_tables WHERE schemaname = 'public' LOOP "
+    "EXECUTE format('DELETE FROM public.%I', name); END LOOP; END $$; "
+    "SELECT setval(oid::regclass, 1, false) FROM pg_class "
+    "WHERE relkind = 'S' AND relnamespace = 'public'::regnamespace";
+
+std::string fingerprint(const Connection& database) { return database.run(kFingerprint)[0][0]; }
+
+/// Empties the tables of a database that is still as `made`; false when it has to be made anew.
+bool empty_again(const fs::path& host, const std::string& made) {
+  try {
+    const Connection database(host, "mediaserver");
+    const auto size = database.run("SELECT pg_database_size('mediaserver')")[0][0];
+    if (std::stol(size) > kLargestReused || fingerprint(database) != made) return false;
+    database.run(kDeleteRows);
+    return true;
+  } catch (const std::runtime_error&) {
+    return false;  // not there, or not as it was
+  }
+}
+
 std::string read_schema() {
   std::ifstream in(MEDIIDX_SCHEMA);
   std::string text(std::istreambuf_iterator<char>(in), {});
@@ -86,6 +126,7 @@ std::string read_schema() {
 struct TestServer::Parts {
   fs::path folder = server_folder();
   tool::PostgresServer server{folder};
+  std::string made;  ///< The fingerprint of the template.
 };
 
 TestServer& TestServer::get() {
@@ -99,7 +140,9 @@ TestServer::TestServer() : parts_(new Parts) {
   setenv("PGHOST", socket_folder().c_str(), 1);
   unsetenv("PGPORT");
   Connection(socket_folder(), "postgres").run("CREATE DATABASE mediaserver_template");
-  Connection(socket_folder(), "mediaserver_template").run(read_schema());
+  const Connection database(socket_folder(), "mediaserver_template");
+  database.run(read_schema());
+  parts_->made = fingerprint(database);
 }
 
 TestServer::~TestServer() {
@@ -115,6 +158,9 @@ void TestServer::stop() { parts_->server.stop(); }
 
 void TestServer::fresh_database() {
   const Connection admin(socket_folder(), "postgres");
+  admin.run(kEndSessions);
+  // Deleting the few rows of a test is a fraction of making a database.
+  if (empty_again(socket_folder(), parts_->made)) return;
   admin.run("DROP DATABASE IF EXISTS mediaserver WITH (FORCE)");
   admin.run("CREATE DATABASE mediaserver TEMPLATE mediaserver_template");
 }
@@ -145,10 +191,7 @@ long DatabaseTest::count(const std::string& table, const std::string& where) {
 }
 
 void DatabaseTest::cut_connections() {
-  Connection(TestServer::get().socket_folder(), "postgres")
-      .run(
-          "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity "
-          "WHERE datname = 'mediaserver'");
+  Connection(TestServer::get().socket_folder(), "postgres").run(kEndSessions);
 }
 
 std::string quoted(const std::string& text) {

@@ -24,7 +24,8 @@ class TestServer {
  public:
   static TestServer& get();
   const std::filesystem::path& socket_folder() const;
-  /// Makes "mediaserver" anew from the template with the schema; sessions on it are ended.
+  /// Gives an empty "mediaserver" with the schema, made anew where a test changed more than rows;
+  /// sessions on it are ended.
   void fresh_database();
   /// Runs a statement on "mediaserver" over a connection of its own. SQL null reads as "<null>".
   /// Throws std::runtime_error with the server's message.

@@ -77,6 +77,7 @@ void walk_pattern(std::string_view pattern, Wildcard wildcard, Text text) {
 }
 
 std::string shape_of_pattern(std::string_view pattern) {
+  if (pattern == "/%") return "/%";  // every absolute path: not like any other prefix
   std::string shape;
   walk_pattern(
       pattern, [&](char c) { shape += c; },

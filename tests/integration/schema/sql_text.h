@@ -16,7 +16,8 @@ namespace mediidx::test {
 std::vector<std::string> split_statements(std::string_view text);
 
 /// The statement with one blank between words and signs, each number as 0, each literal as '?' and
-/// each list after IN as (...). The wildcards of a pattern stay: LIKE '%x/%' becomes LIKE '%x%'.
+/// each list after IN as (...). The wildcards of a pattern stay: LIKE '%x/%' becomes LIKE '%x%';
+/// the pattern '/%', which all paths match, stays as a whole.
 std::string shape_of(std::string_view statement);
 
 /// How far the values of a statement are from ordinary ones, 0 being ordinary: patterns with so

@@ -46,6 +46,8 @@ INSTANTIATE_TEST_SUITE_P(
                               "INSERT INTO a ( x , y2 ) VALUES ( 0 , 0 )"},
                     ShapeCase{"Patterns", R"(DELETE FROM a WHERE p LIKE '%a\%b\\/%')",
                               "DELETE FROM a WHERE p LIKE '%x%'"},
+                    ShapeCase{"ThePatternOfAllPaths", "SELECT * FROM a WHERE p like '/%'",
+                              "SELECT * FROM a WHERE p like '/%'"},
                     ShapeCase{"ExactPatterns", R"(DELETE FROM a WHERE p like 'a\_日本')",
                               "DELETE FROM a WHERE p like 'x'"},
                     ShapeCase{"SingleCharacterWildcards", "DELETE FROM a WHERE p like 'a_b'",

@@ -39,6 +39,10 @@ const std::vector<Exception>& exceptions() {
                   R"((?!.*\b(path|id)\b).+)",
                   optimize),
        "a caller's own condition, on columns that the library never searches"},
+      {std::regex(R"((SELECT|UPDATE|DELETE) .+ (WHERE|where) path like '/?%'.*)", optimize),
+       "a prefix over everything"},
+      {std::regex(R"(SELECT .+ WHERE path (< >|! =) '\?'.*)", optimize),
+       "a caller asks for all rows but those of one path"},
   };
   return all;
 }

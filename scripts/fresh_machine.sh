@@ -141,6 +141,12 @@ check_nothing_installed() {
   ! grep -q 'dev: installing' "$here/last.log" || fail 'the second call installed something'
 }
 
+# The sample library holds files that cannot be indexed, all of them in one folder.
+check_sample() {
+  grep -q '/damaged/' "$here/last.log" || fail 'the damaged files were not named'
+  ! grep 'not indexed:' "$here/last.log" | grep -qv '/damaged/' || fail 'a good file was not indexed'
+}
+
 # front_door TREE FOLDER RUNNER…: the verbs, through a runner that takes a shell command.
 front_door() {
   local tree=$1 folder=$2
@@ -152,8 +158,10 @@ front_door() {
   timed 'build' "$@" './dev build'
   check_build "$tree$folder/build"
   timed 'run' "$@" './dev run'
+  check_sample
   check_system "$tree"
   timed 'run again' "$@" './dev run'
+  check_sample
   check_nothing_installed
   check_system "$tree"
   timed 'test' "$@" './dev test'

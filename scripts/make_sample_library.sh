@@ -285,7 +285,14 @@ odd_names() {
   plain "$work/a.mp3" "$folder/100%/50_50/back\\slash/deep.mp3"
 }
 
-# Cue sheets: beside a FLAC image, beside a WAV in windows-1251, and one whose sound is not there.
+# ferry_cue WAV: a cue sheet in Cyrillic with CRLF line ends.
+ferry_cue() {
+  printf '%s\r\n' 'PERFORMER "Мельница"' 'TITLE "Ночной паром"' "FILE \"$1\" WAVE" \
+    '  TRACK 01 AUDIO' '    TITLE "Причал"' '    INDEX 01 00:00:00' \
+    '  TRACK 02 AUDIO' '    TITLE "Маяк"' '    INDEX 01 00:00:37'
+}
+
+# Cue sheets: beside a FLAC image, beside a WAV in UTF-16, and one whose sound is not there.
 cue_sheets() {
   flac_tagged "$work/image.flac" 'music/Night Ferry/Night Ferry.flac' 'TITLE=Night Ferry' \
     'ARTIST=The Ferrymen' 'ALBUM=Night Ferry' 'DATE=2016' 'GENRE=Folk'
@@ -310,11 +317,10 @@ FILE "Night Ferry.flac" WAVE
     INDEX 01 00:02:37
 CUE
   plain "$work/b.wav" 'music/Паром/parom.wav'
-  printf 'PERFORMER "%b"\r\nTITLE "%b"\r\nFILE "parom.wav" WAVE\r\n' \
-    '\xcc\xe5\xeb\xfc\xed\xe8\xf6\xe0' '\xcd\xee\xf7\xed\xee\xe9 \xef\xe0\xf0\xee\xec' >"$work/cue"
-  printf '  TRACK 01 AUDIO\r\n    TITLE "%b"\r\n    INDEX 01 00:00:00\r\n' \
-    '\xcf\xf0\xe8\xf7\xe0\xeb' >>"$work/cue"
-  plain "$work/cue" 'music/Паром/parom.cue'
+  {
+    printf '\377\376'
+    ferry_cue parom.wav | iconv -f UTF-8 -t UTF-16LE
+  } | text 'music/Паром/parom.cue'
   text 'music/Night Ferry/lost.cue' <<'CUE'
 PERFORMER "The Ferrymen"
 TITLE "Lost Tapes"
@@ -385,8 +391,10 @@ WPL
   text 'playlists/empty.m3u' </dev/null
 }
 
-# What cannot be read, and what is no medium at all.
+# What cannot be read, and what is no medium at all. The cue sheet is in windows-1251, which nobody
+# can know without the setting for it.
 damaged() {
+  ferry_cue '../music/Паром/parom.wav' | iconv -f UTF-8 -t CP1251 | text 'damaged/windows-1251.cue'
   text 'damaged/empty.mp3' </dev/null
   text 'damaged/empty.jpg' </dev/null
   head -c 700 "$work/a.mp3" | text 'damaged/truncated.mp3'

@@ -19,7 +19,7 @@
 namespace mediidx::test {
 namespace {
 
-constexpr int kSequences = 40;  // for each seed
+constexpr int kSequences = 34;  // for each seed
 constexpr int kSteps = 40;
 
 class AlbumRules : public CatalogueTest, public testing::WithParamInterface<unsigned> {

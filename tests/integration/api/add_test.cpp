@@ -182,6 +182,14 @@ TEST_F(AddingJson, TakesReplayGainOfAnotherTypeAsZero) {
   EXPECT_THAT(logged(), IsEmpty());
 }
 
+TEST_F(AddingJson, HoldsReplayGainWithinAFloat) {
+  const auto json = song(R"({"rg_track_gain": 1e300, "rg_track_peak": "-1e300",
+                             "rg_album_gain": "nan", "rg_album_peak": "inf"})");
+  EXPECT_EQ(TAVOMediaIndexAdd_Json(json, MEDIA_TABLE_MUSIC), 0);
+  const std::string largest = "340282346638528859811704183484516925440.000000";
+  EXPECT_EQ(stored_gains(), (std::vector<Row>{{largest, "-" + largest, "0.000000", "0.000000"}}));
+}
+
 TEST_F(AddingJson, StoresNoReplayGainWithoutATrackGain) {
   EXPECT_EQ(TAVOMediaIndexAdd_Json(song(R"({"rg_album_gain": 1})"), MEDIA_TABLE_MUSIC), 0);
   EXPECT_EQ(TAVOMediaIndexAdd_Json(song(R"({"rg_track_gain": null})"), MEDIA_TABLE_MUSIC), 0);

@@ -5,8 +5,6 @@
 #include <dlfcn.h>
 #include <tavosdk.h>
 
-#include <cstdlib>
-#include <cstring>
 #include <regex>
 
 #include "mediidx/index_folder.h"
@@ -77,6 +75,8 @@ HelperTest::~HelperTest() { platform_answers() = {}; }
 
 namespace {
 
+TAVOHOMECHECK g_home;  // this program's own answer
+
 template <class Call>
 Call next_definition(const char* name) {
   return reinterpret_cast<Call>(dlsym(RTLD_NEXT, name));
@@ -101,8 +101,15 @@ TAVOSDK_EXPORT int TAVOServiceHomePathCheck(const char* path, int flag_a, int fl
   const auto& answers = mediidx::test::platform_answers();
   if (answers.home_check_fails) return -1;
   if (answers.home_user.empty()) return call(path, flag_a, flag_b, result);
-  *result = static_cast<TAVOHOMECHECK*>(std::calloc(1, sizeof(TAVOHOMECHECK)));
-  answers.home_user.copy((*result)->user, sizeof(*result)->user - 1);
+  g_home = {};
+  answers.home_user.copy(g_home.user, sizeof g_home.user - 1);
+  *result = &g_home;
   return 1;
+}
+
+TAVOSDK_EXPORT void TAVOHomeCheckResultFree(TAVOHOMECHECK* result) {
+  static const auto call =
+      next_definition<decltype(&TAVOHomeCheckResultFree)>("TAVOHomeCheckResultFree");
+  if (result != &g_home) call(result);
 }
 }

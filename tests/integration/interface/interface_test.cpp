@@ -8,8 +8,7 @@
 #include <tavodb.h>
 #include <tavosdk.h>
 
-#include <cstdlib>
-#include <cstring>
+#include <cstdio>
 #include <string>
 #include <vector>
 
@@ -27,6 +26,7 @@ using testing::ElementsAre;
 /// The calls that reached this program instead of the platform, while it stands before it.
 std::vector<std::string> g_calls;
 bool g_stands_before = false;
+TAVOSHARE g_share{"replaced", "/replaced", 0};
 
 }  // namespace
 
@@ -34,9 +34,12 @@ extern "C" {
 
 TAVOSDK_EXPORT int TAVOShareGet(const char* name, TAVOSHARE** share) {
   g_calls.push_back(std::string("TAVOShareGet ") + name);
-  *share = static_cast<TAVOSHARE*>(std::calloc(1, sizeof(TAVOSHARE)));
-  std::strcpy((*share)->path, "/replaced");
+  *share = &g_share;
   return 0;
+}
+
+TAVOSDK_EXPORT void TAVOShareFree(TAVOSHARE* share) {
+  if (share) g_calls.push_back(std::string("TAVOShareFree ") + share->path);
 }
 
 TAVOSDK_EXPORT int IndexIsPathRemoteMount(const char* path) {
@@ -75,7 +78,7 @@ class Replacement : public testing::Test {
 TEST_F(Replacement, OfTheShareLookupIsCalled) {
   root.set_index_folders(R"([{"path": "/any/folder", "music": true}])");
   IndexFolderInit();
-  EXPECT_THAT(g_calls, ElementsAre("TAVOShareGet any"));
+  EXPECT_THAT(g_calls, ElementsAre("TAVOShareGet any", "TAVOShareFree /replaced"));
   EXPECT_EQ(IndexFolderPositionGet("/replaced/folder"), 0);
 }
 

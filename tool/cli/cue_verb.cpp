@@ -12,6 +12,7 @@
 #include "cli/row_output.h"
 #include "cli/verbs.h"
 #include "mediidx/cue_sheet.h"
+#include "mediidx/index_folder.h"
 #include "mediidx/playlist.h"
 #include "playlist/cue_charset.h"
 #include "store/data_folder.h"
@@ -80,7 +81,8 @@ int run_cue_show(const Arguments& arguments) {
   const char* extension = TAVOIndexExtGet(file.c_str());
   if (!extension || strcasecmp(extension, "cue") != 0) throw no_such_kind(file, "cue sheet");
   const DataFolder folder(arguments.value("--data-dir"));
-  // The index knows how long the audio files are.
+  // The index knows how long the audio files are, of folders that are indexed.
+  IndexFolderInit();
   const Database database(folder);
   Records records;
   if (TAVOParseCueByPath(out(records), file.c_str()) != 0) {

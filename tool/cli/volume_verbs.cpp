@@ -129,7 +129,7 @@ bool has_rows(Database& database, const std::string& share) {
 /// The folder of a share that is known by this very name; empty when there is none.
 std::string folder_of(const std::string& name) {
   OwnedShare share;
-  if (TAVOShareGet(name.c_str(), out(share)) != 0 || !share) return "";
+  if (TAVOShareGet(name.c_str(), out(share)) != 0) return "";
   return share->path;
 }
 

@@ -100,18 +100,21 @@ void Indexer::save(const MediaFile& file) {
   if (result == 0) {
     ++report_.files[static_cast<std::size_t>(file.kind)];
   } else {
-    take_failure(file.path, file.kind == Kind::kCueSheet ? "the cue sheet cannot be understood"
-                                                         : "it could not be saved");
+    const bool is_cue_sheet = file.kind == Kind::kCueSheet;
+    take_failure(file.path,
+                 is_cue_sheet ? "the cue sheet cannot be understood" : "it could not be saved",
+                 is_cue_sheet ? "the sheet's tracks: " : "");
   }
 }
 
-void Indexer::take_failure(const std::string& path, const std::string& fallback) {
+void Indexer::take_failure(const std::string& path, const std::string& fallback,
+                           const std::string& about) {
   const auto reason = database_.last_error();
   if (!database_.answers()) {
     throw std::runtime_error("the database no longer answers" +
                              (reason.empty() ? "" : ": " + reason));
   }
-  report_.failures.push_back({path, reason.empty() ? fallback : reason});
+  report_.failures.push_back({path, reason.empty() ? fallback : about + reason});
 }
 
 }  // namespace mediidx::tool

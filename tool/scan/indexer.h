@@ -41,7 +41,9 @@ class Indexer {
   void add_folder(const std::string& path);
   void add_file(const FoundFile& file);
   void save(const MediaFile& file);
-  void take_failure(const std::string& path, const std::string& fallback);
+  /// The reason is the database's, behind `about`, or else `fallback`.
+  void take_failure(const std::string& path, const std::string& fallback,
+                    const std::string& about = {});
   bool asks_to_stop(const std::string& path);
 
   Database& database_;

@@ -56,8 +56,9 @@ void read_video(MediaFile& file) {
   file.audio_codec = codec_of(audio);
   read_audio_stream(audio, file);
   if (video) read_video_stream(input, input.context()->streams[video->index], file);
-  // What is not sound is picture, where only the whole is known.
-  if (video && file.video_bitrate == 0 && file.frame_bitrate > file.bitrate) {
+  // What is not sound is picture, where the sound's share of the whole is known.
+  const bool sound_known = !audio || file.bitrate > 0;
+  if (video && sound_known && file.video_bitrate == 0 && file.frame_bitrate > file.bitrate) {
     file.video_bitrate = file.frame_bitrate - file.bitrate;
   }
 }

@@ -1,0 +1,63 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+
+/// The built command as a process of its own.
+#ifndef MEDIIDX_TESTS_INTEGRATION_TOOL_COMMAND_H_
+#define MEDIIDX_TESTS_INTEGRATION_TOOL_COMMAND_H_
+
+#include <sys/types.h>
+
+#include <filesystem>
+#include <functional>
+#include <map>
+#include <optional>
+#include <string>
+#include <vector>
+
+namespace mediidx::test {
+
+/// What a run of the command left.
+struct Outcome {
+  int status;  ///< Exit status; 128 + signal.
+  std::string out;
+  std::string err;
+};
+
+/// How it is run.
+struct Setting {
+  std::map<std::string, std::string> environment;  ///< Over what the test has.
+  bool without_server = false;                     ///< None of the variables that name a server.
+  std::optional<uid_t> user;                       ///< Outcome as this user, by root only.
+  bool on_terminal = false;                        ///< Both outputs go to one terminal, into `out`.
+  bool reader_gone = false;                        ///< Nobody reads standard output.
+  std::string program;                             ///< Another copy of the command.
+  /// Called with the process id while it runs.
+  std::function<void(pid_t)> meanwhile;
+};
+
+/// Runs the command with these arguments, without a shell.
+Outcome run_mediidx(const std::vector<std::string>& arguments, const Setting& setting = {});
+
+/// A folder with a short name that every user may enter, gone with the object.
+class OpenFolder {
+ public:
+  OpenFolder();
+  ~OpenFolder();
+  OpenFolder(const OpenFolder&) = delete;
+  OpenFolder& operator=(const OpenFolder&) = delete;
+  std::string at(const std::string& relative) const { return (path_ / relative).string(); }
+  const std::filesystem::path& path() const { return path_; }
+  /// Copies a file of the sample library.
+  std::string take_sample(const std::string& sample, const std::string& relative) const;
+  std::string write(const std::string& relative, const std::string& content) const;
+
+ private:
+  std::filesystem::path path_;
+};
+
+/// Processes whose command line has this word as one of its arguments.
+std::vector<pid_t> processes_with(const std::string& argument);
+
+}  // namespace mediidx::test
+
+#endif

@@ -37,7 +37,14 @@ struct ConnectArguments {
 const ConnectArguments& last_connect();
 
 // The sanitizers bring an allocator of their own, which cannot be stood before.
-#if !defined(__SANITIZE_ADDRESS__)
+#if defined(__has_feature)
+#if __has_feature(address_sanitizer)
+#define MEDIIDX_SANITIZED_ALLOCATOR 1
+#endif
+#elif defined(__SANITIZE_ADDRESS__)
+#define MEDIIDX_SANITIZED_ALLOCATOR 1
+#endif
+#ifndef MEDIIDX_SANITIZED_ALLOCATOR
 #define MEDIIDX_ALLOCATIONS_CAN_FAIL 1
 
 enum class Allocator { kMalloc, kCalloc, kRealloc };

@@ -50,8 +50,9 @@ OwnedHandle open_handle() {
 
 bool execute(tavodb_connection* conn, const char* sql, const Message& failure,
              OwnedResult* result) {
-  OwnedResult unused;
-  if (TAVODBExecute(conn, sql, out(result ? *result : unused)) != -1) return true;
+  const int status =
+      result ? TAVODBExecute(conn, sql, out(*result)) : TAVODBExecute(conn, sql, nullptr);
+  if (status != -1) return true;
   kDatabaseLog.error(failure.shape, failure.line, "Failed to exec [%s] (%s)%s", shown(sql),
                      TAVODBErrorGet(conn), failure.stop);
   return false;

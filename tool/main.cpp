@@ -8,10 +8,16 @@
 
 #include "cli/interrupt.h"
 #include "cli/verbs.h"
+#include "folders/programs.h"
 
 int main(int argc, char** argv) {
   // Only for the width of characters; everything else stays as programs read it.
   std::setlocale(LC_CTYPE, "C.UTF-8");
   mediidx::tool::note_signals();
-  return mediidx::tool::run_command(std::vector<std::string>(argv + 1, argv + argc));
+  const std::vector<std::string> words(argv + (argc > 0 ? 1 : 0), argv + argc);
+  const std::string program = argc > 0 ? argv[0] : "";
+  if (const auto run = mediidx::tool::program_named(program)) {
+    return mediidx::tool::run_guarded([&] { return run(program, words); });
+  }
+  return mediidx::tool::run_command(words);
 }

@@ -8,11 +8,13 @@
 #include "cli/output.h"
 #include "cli/progress.h"
 #include "cli/verbs.h"
+#include "mediidx/index_folder.h"
 #include "scan/file_walk.h"
 #include "scan/indexer.h"
 #include "scan/known_folders.h"
 #include "store/data_folder.h"
 #include "store/database.h"
+#include "store/pid_file.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -75,6 +77,8 @@ int run_index(const Arguments& arguments) {
   std::vector<std::string> folders;
   for (const auto& named : arguments.operands) folders.push_back(real_folder(named));
   const DataFolder data(arguments.value("--data-dir"));
+  reload_on_hangup();
+  const PidFile pid_file(data);
   Database database(data);
   make_known(data, folders);
   const auto found = walk(data, folders);
@@ -82,6 +86,7 @@ int run_index(const Arguments& arguments) {
     Progress progress(found.folders.size() + found.files.size());
     Indexer indexer(database, [&progress](const std::string& path) {
       if (noted_signal()) return false;
+      if (take_hangup()) IndexFolderUpdate();
       progress.step(path);
       return true;
     });

@@ -10,10 +10,13 @@ namespace mediidx::tool {
 namespace {
 
 volatile sig_atomic_t first_signal = 0;
+volatile sig_atomic_t hangup = 0;
 
 void note(int number) {
   if (first_signal == 0) first_signal = number;
 }
+
+void note_hangup(int) { hangup = 1; }
 
 }  // namespace
 
@@ -31,5 +34,18 @@ void note_signals() {
 }
 
 int noted_signal() { return first_signal; }
+
+void reload_on_hangup() {
+  struct sigaction action{};
+  action.sa_handler = note_hangup;
+  action.sa_flags = SA_RESTART;
+  sigaction(SIGHUP, &action, nullptr);
+}
+
+bool take_hangup() {
+  if (hangup == 0) return false;
+  hangup = 0;
+  return true;
+}
 
 }  // namespace mediidx::tool

@@ -14,6 +14,13 @@ void note_signals();
 /// The signal that came first; 0 while none has.
 int noted_signal();
 
+/// From now on SIGHUP does not stop, but says that the configuration has changed; also where it was
+/// ignored.
+void reload_on_hangup();
+
+/// True when such a signal came since the last call.
+bool take_hangup();
+
 }  // namespace mediidx::tool
 
 #endif

@@ -31,6 +31,26 @@ constexpr Option kResetOptions[] = {
     {"--yes", nullptr, "do not ask"},
 };
 
+constexpr Option kDropMissing{"--drop-missing", nullptr,
+                              "give up configured folders that are not there"};
+constexpr Option kFolderAddOptions[] = {
+    {"--music", nullptr, "index its music; without a kind, all three are indexed"},
+    {"--photo", nullptr, "index its photos"},
+    {"--video", nullptr, "index its videos"},
+    {"--name", "NAME", "how the folder is called in lists"},
+    kDropMissing,
+};
+constexpr Option kFolderSetOptions[] = {
+    {"--music", nullptr, "index its music"},
+    {"--no-music", nullptr, "leave its music out"},
+    {"--photo", nullptr, "index its photos"},
+    {"--no-photo", nullptr, "leave its photos out"},
+    {"--video", nullptr, "index its videos"},
+    {"--no-video", nullptr, "leave its videos out"},
+    kDropMissing,
+};
+constexpr Option kFolderRemoveOptions[] = {kDropMissing};
+
 int run_help(const Arguments& arguments) {
   std::string name;
   for (const auto& word : arguments.operands) name += (name.empty() ? "" : " ") + word;
@@ -137,6 +157,41 @@ const Verb kVerbs[] = {
      {},
      run_db_reset},
     {"db shell", "", "open psql on the database", 0, 0, {}, {}, run_db_shell},
+    {"folder list",
+     "",
+     "show the folders chosen for indexing",
+     0,
+     0,
+     kJsonOption,
+     {},
+     run_folder_list},
+    {"folder add",
+     "FOLDER",
+     "choose a folder for indexing, and index it",
+     1,
+     1,
+     kFolderAddOptions,
+     {},
+     run_folder_add},
+    {"folder set",
+     "FOLDER",
+     "choose the kinds of media of a folder, and index it again",
+     1,
+     1,
+     kFolderSetOptions,
+     {},
+     run_folder_set},
+    {"folder remove",
+     "FOLDER",
+     "no longer index a folder, and forget what it held",
+     1,
+     1,
+     kFolderRemoveOptions,
+     {},
+     run_folder_remove},
+    {"share list", "", "show the shares", 0, 0, kJsonOption, {}, run_share_list},
+    {"share add", "NAME FOLDER", "make a folder a share", 2, 2, {}, {}, run_share_add},
+    {"share remove", "NAME", "forget a share, not its folder", 1, 1, {}, {}, run_share_remove},
     {"help", "[VERB]", "show this help, or that of a verb", 0, kWordsOfAVerb, {}, {}, run_help},
     {"version", "", "show the version", 0, 0, {}, {}, run_version},
 };
@@ -157,8 +212,12 @@ int run(const std::vector<std::string>& words) {
 std::span<const Verb> verbs() { return kVerbs; }
 
 int run_command(const std::vector<std::string>& words) {
+  return run_guarded([&words] { return run(words); });
+}
+
+int run_guarded(const std::function<int()>& what) {
   try {
-    const int status = run(words);
+    const int status = what();
     flush_output();
     return status;
   } catch (const UsageError& error) {

@@ -5,6 +5,7 @@
 #ifndef MEDIIDX_TOOL_CLI_VERBS_H_
 #define MEDIIDX_TOOL_CLI_VERBS_H_
 
+#include <functional>
 #include <span>
 #include <string>
 #include <vector>
@@ -27,6 +28,9 @@ std::span<const Verb> verbs();
 /// Runs the command line behind the program's name; its exit status. Complains on standard error.
 int run_command(const std::vector<std::string>& words);
 
+/// Runs `what`; its exit status, or that of the error that it ends with, complained of likewise.
+int run_guarded(const std::function<int()>& what);
+
 /* The verbs. Each returns its exit status, and throws std::exception for what ends it. */
 
 int run_index(const Arguments& arguments);
@@ -43,6 +47,13 @@ int run_db_init(const Arguments& arguments);
 int run_db_vacuum(const Arguments& arguments);
 int run_db_reset(const Arguments& arguments);
 int run_db_shell(const Arguments& arguments);
+int run_folder_list(const Arguments& arguments);
+int run_folder_add(const Arguments& arguments);
+int run_folder_set(const Arguments& arguments);
+int run_folder_remove(const Arguments& arguments);
+int run_share_list(const Arguments& arguments);
+int run_share_add(const Arguments& arguments);
+int run_share_remove(const Arguments& arguments);
 
 /// The things that "list" knows.
 std::span<const char* const> list_choices();

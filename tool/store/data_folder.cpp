@@ -87,8 +87,12 @@ void DataFolder::make_root() const {
     fs::create_directories(root() / folder);
   }
   // The library has text converted by the program of this name.
-  const auto converter = fs::read_symlink("/proc/self/exe").parent_path() / "mediidx-iconv";
-  link_program(converter, root() / "usr/bin/php");
+  const auto command = fs::read_symlink("/proc/self/exe");
+  link_program(command.parent_path() / "mediidx-iconv", root() / "usr/bin/php");
+  // And it has folders indexed by these: the command itself under other names.
+  for (const char* name : {"tavoindex", "tavoindex_mgr"}) {
+    link_program(command, root() / "usr/tavo/bin" / name);
+  }
 }
 
 FileLock::FileLock(const fs::path& file)

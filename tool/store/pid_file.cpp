@@ -1,0 +1,40 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+#include "store/pid_file.h"
+
+#include <unistd.h>
+
+#include <fstream>
+#include <stdexcept>
+#include <system_error>
+
+namespace mediidx::tool {
+namespace {
+
+namespace fs = std::filesystem;
+
+fs::path file_of(const DataFolder& data) { return data.root() / "var/run/tavoindexd.pid"; }
+fs::path lock_of(const DataFolder& data) { return data.path() / "index.lock"; }
+
+}  // namespace
+
+PidFile::PidFile(const DataFolder& data)
+    : file_(file_of(data)), lock_(lock_of(data)), is_ours_(lock_.try_own()) {
+  if (!is_ours_) return;
+  std::ofstream out(file_, std::ios::trunc);
+  out << getpid() << "\n";
+  out.close();
+  if (!out) throw std::runtime_error(file_.string() + " cannot be written");
+}
+
+PidFile::~PidFile() {
+  std::error_code ignored;
+  if (is_ours_) fs::remove(file_, ignored);
+}
+
+void PidFile::remove_stale(const DataFolder& data) {
+  FileLock lock(lock_of(data));
+  if (lock.try_own()) fs::remove(file_of(data));
+}
+
+}  // namespace mediidx::tool

@@ -1,0 +1,33 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+
+/// How a running indexer is found by those who change the configuration.
+#ifndef MEDIIDX_TOOL_STORE_PID_FILE_H_
+#define MEDIIDX_TOOL_STORE_PID_FILE_H_
+
+#include "store/data_folder.h"
+
+namespace mediidx::tool {
+
+/// This process in "var/run/tavoindexd.pid" below the root, gone with the object. While another
+/// process holds the file it is left alone. Whoever is named there has to take SIGHUP as a request
+/// to read the configuration again.
+class PidFile {
+ public:
+  explicit PidFile(const DataFolder& data);
+  ~PidFile();
+  PidFile(const PidFile&) = delete;
+  PidFile& operator=(const PidFile&) = delete;
+
+  /// Removes the file of a process that was killed, so that nobody else is signalled for it.
+  static void remove_stale(const DataFolder& data);
+
+ private:
+  std::filesystem::path file_;
+  FileLock lock_;
+  bool is_ours_;
+};
+
+}  // namespace mediidx::tool
+
+#endif

@@ -2,7 +2,10 @@
 // SPDX-License-Identifier: MIT
 #include "folders/configured_folders.h"
 
+#include <json/reader.h>
+
 #include <filesystem>
+#include <fstream>
 #include <stdexcept>
 
 #include "indexfolder/entry.h"
@@ -21,18 +24,26 @@ std::string ConfiguredFolder::shown() const {
 }
 
 std::vector<ConfiguredFolder> configured_folders() {
-  const auto entries = IndexFolderConfOpen();
-  if (!entries.isArray()) {
-    throw std::runtime_error("the index-folder configuration is not a list");
-  }
   std::vector<ConfiguredFolder> out;
-  for (const auto& entry : entries) {
+  for (const auto& entry : IndexFolderConfOpen()) {
     if (!is_usable_entry(entry)) continue;
     auto folder = absolute_folder(entry["path"].asString()).value_or("");
     while (folder.size() > 1 && folder.ends_with('/')) folder.pop_back();
     out.push_back({entry, folder});
   }
   return out;
+}
+
+void check_configuration(const std::filesystem::path& root) {
+  const auto file = root / "usr/tavo/etc/index_folder.conf";
+  std::error_code ignored;
+  if (!std::filesystem::exists(file, ignored) || std::filesystem::is_empty(file, ignored)) return;
+  std::ifstream in(file, std::ios::binary);
+  Json::Value top;
+  std::string errors;
+  if (Json::parseFromStream(Json::CharReaderBuilder(), in, &top, &errors) && top.isArray()) return;
+  throw std::runtime_error("the index-folder configuration is not a list: repair or remove " +
+                           escape_for_display(file.string()));
 }
 
 }  // namespace mediidx::tool

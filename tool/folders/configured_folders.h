@@ -7,6 +7,7 @@
 
 #include <json/value.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -23,9 +24,12 @@ struct ConfiguredFolder {
   std::string shown() const;
 };
 
-/// The entries in the file's order, without those that cannot be used. Throws std::runtime_error
-/// when the file holds no list.
+/// The entries in the file's order, without those that cannot be used. What is no list has none.
 std::vector<ConfiguredFolder> configured_folders();
+
+/// Throws std::exception when the file holds anything but a list: to the library it is an empty
+/// one, and changing that would overwrite what is there.
+void check_configuration(const std::filesystem::path& root);
 
 }  // namespace mediidx::tool
 

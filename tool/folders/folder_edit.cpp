@@ -41,6 +41,7 @@ void check_all_there(const std::vector<ConfiguredFolder>& folders) {
 /// Nobody else changes the settings between reading and writing them.
 ShareFile read_locked(FileLock& lock, const DataFolder& data) {
   lock.own();
+  check_configuration(data.root());
   return ShareFile(data.root());
 }
 

@@ -78,6 +78,7 @@ class SpawnAttributes {
 
 StartedChild start_child(const std::vector<const char*>& arguments, const ChildStreams& streams) {
   std::vector<char*> argv;
+  argv.reserve(arguments.size() + 1);
   for (const char* argument : arguments) argv.push_back(const_cast<char*>(argument));
   argv.push_back(nullptr);
   const SpawnActions actions(streams);

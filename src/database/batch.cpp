@@ -74,7 +74,8 @@ class InCondition {
   /// it.
   const char* end() {
     if (buffer_.get()[used_ - 1] == ',') --used_;
-    std::strcpy(buffer_.get() + used_, ")");
+    buffer_.get()[used_] = ')';
+    buffer_.get()[used_ + 1] = '\0';
     return buffer_.get();
   }
 

@@ -123,8 +123,8 @@ using mediidx::no_throw;
 Json::Value createRule(std::string name, std::string path, bool photo, bool music, bool video,
                        bool isDefault) {
   Json::Value rule(Json::objectValue);
-  rule["name"] = std::move(name);
-  rule["path"] = std::move(path);
+  rule["name"] = name;
+  rule["path"] = path;
   rule["photo"] = photo;
   rule["music"] = music;
   rule["video"] = video;

@@ -16,8 +16,9 @@ char g_root[PATH_MAX];
 
 extern "C" int TAVOMediaIndexRootSet(const char* root) {
   if (!root) root = "";
-  if (std::strlen(root) >= sizeof(g_root)) return -1;
-  std::strcpy(g_root, root);
+  const auto length = std::strlen(root);
+  if (length >= sizeof(g_root)) return -1;
+  std::memcpy(g_root, root, length + 1);
   return 0;
 }
 

@@ -34,7 +34,6 @@ void cut(std::string& text) { text.resize(cut_at_character(text, kAggregatedWidt
 GenreTokens::GenreTokens(const char* genres) : copy_(strdup(genres)), start_(copy_.get()) {}
 
 char* GenreTokens::next() {
-  // NOLINTNEXTLINE(clang-analyzer-unix.Malloc): copy_ frees it.
   char* token = strtok_r(start_, ";", &rest_);
   start_ = nullptr;
   return token;

@@ -70,7 +70,7 @@ std::string clock_text(double seconds) {
 }
 
 std::string cell_text(const Rows& rows, const RowColumn& column) {
-  const auto text = rows.text(column.name);
+  auto text = rows.text(column.name);
   switch (column.type) {
     case ValueType::kNumber:
       return text == "0" ? "" : text;

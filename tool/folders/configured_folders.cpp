@@ -2,11 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "folders/configured_folders.h"
 
-#include <json/reader.h>
-
 #include <filesystem>
-#include <fstream>
-#include <stdexcept>
 
 #include "indexfolder/entry.h"
 #include "mediidx/index_folder.h"
@@ -32,18 +28,6 @@ std::vector<ConfiguredFolder> configured_folders() {
     out.push_back({entry, folder});
   }
   return out;
-}
-
-void check_configuration(const std::filesystem::path& root) {
-  const auto file = root / "usr/tavo/etc/index_folder.conf";
-  std::error_code ignored;
-  if (!std::filesystem::exists(file, ignored) || std::filesystem::is_empty(file, ignored)) return;
-  std::ifstream in(file, std::ios::binary);
-  Json::Value top;
-  std::string errors;
-  if (Json::parseFromStream(Json::CharReaderBuilder(), in, &top, &errors) && top.isArray()) return;
-  throw std::runtime_error("the index-folder configuration is not a list: repair or remove " +
-                           escape_for_display(file.string()));
 }
 
 }  // namespace mediidx::tool

@@ -7,7 +7,6 @@
 
 #include <json/value.h>
 
-#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -26,10 +25,6 @@ struct ConfiguredFolder {
 
 /// The entries in the file's order, without those that cannot be used. What is no list has none.
 std::vector<ConfiguredFolder> configured_folders();
-
-/// Throws std::exception when the file holds anything but a list: to the library it is an empty
-/// one, and changing that would overwrite what is there.
-void check_configuration(const std::filesystem::path& root);
 
 }  // namespace mediidx::tool
 

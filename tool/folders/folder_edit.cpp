@@ -8,6 +8,7 @@
 
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
+#include "scan/known_folders.h"
 #include "store/pid_file.h"
 #include "store/query.h"
 #include "text/utf8.h"

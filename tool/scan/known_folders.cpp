@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "scan/known_folders.h"
 
+#include <json/reader.h>
 #include <json/value.h>
 #include <tavosdk.h>
 
@@ -9,6 +10,7 @@
 #include <climits>
 #include <cstdlib>
 #include <cstring>
+#include <fstream>
 #include <memory>
 #include <stdexcept>
 
@@ -25,12 +27,7 @@ namespace fs = std::filesystem;
 /// The settings of one command: read, changed, and written where they changed.
 class Settings {
  public:
-  explicit Settings(const fs::path& root) : share_file_(root), entries_(IndexFolderConfOpen()) {
-    if (!entries_.isArray()) {
-      throw std::runtime_error("the index-folder configuration below " + root.string() +
-                               " is not a list");
-    }
-  }
+  explicit Settings(const fs::path& root) : share_file_(root), entries_(IndexFolderConfOpen()) {}
 
   void add(const std::string& folder) { add_entry(folder, share_file_.path_of(folder)); }
 
@@ -81,9 +78,22 @@ std::string real_folder(const std::string& named) {
   return folder;
 }
 
+void check_configuration(const fs::path& root) {
+  const auto file = root / "usr/tavo/etc/index_folder.conf";
+  std::error_code ignored;
+  if (!fs::exists(file, ignored) || fs::is_empty(file, ignored)) return;
+  std::ifstream in(file, std::ios::binary);
+  Json::Value top;
+  std::string errors;
+  if (Json::parseFromStream(Json::CharReaderBuilder(), in, &top, &errors) && top.isArray()) return;
+  throw std::runtime_error("the index-folder configuration is not a list: repair or remove " +
+                           escape_for_display(file.string()));
+}
+
 void make_known(const DataFolder& data, const std::vector<std::string>& folders) {
   FileLock lock(data.path() / "lock");
   lock.own();
+  check_configuration(data.root());
   Settings settings(data.root());
   for (const auto& folder : folders) settings.add(folder);
   settings.save();

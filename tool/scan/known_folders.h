@@ -18,6 +18,10 @@ namespace mediidx::tool {
 /// the library never indexes), or not to be stored as text.
 std::string real_folder(const std::string& named);
 
+/// Throws std::exception when the file holds anything but a list: to the library it is an empty
+/// one, and changing that would overwrite what is there.
+void check_configuration(const std::filesystem::path& root);
+
 /// Makes folders (as real_folder gives them) known and loads the configuration: each lies in a
 /// share, a new one when no share holds it, and has an entry with every kind of media switched on.
 /// What is known already is left as it is, but for kinds that are switched off. Throws

@@ -44,6 +44,19 @@ class Indexing : public DatabaseTest {
   OpenFolder media;
 };
 
+TEST_F(Indexing, DoesNotOverwriteAConfigurationThatIsNoList) {
+  media.take_sample(kSong, "a.mp3");
+  ASSERT_EQ(index({media.path()}).status, 0);
+  const auto conf = data.at("d/root/usr/tavo/etc/index_folder.conf");
+  std::ofstream(conf) << "{\"half\": written";
+  const auto run = index({media.path()});
+  EXPECT_EQ(run.status, 1);
+  EXPECT_THAT(run.err, HasSubstr("not a list"));
+  std::ostringstream kept;
+  kept << std::ifstream(conf).rdbuf();
+  EXPECT_EQ(kept.str(), "{\"half\": written");
+}
+
 TEST_F(Indexing, PutsEveryKindIntoItsTable) {
   media.take_sample(kSong, "a.mp3");
   media.take_sample("photos/2021 Harbour/IMG_0001.jpg", "b.jpg");

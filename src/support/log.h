@@ -31,8 +31,8 @@ class Log {
                                            ...) const noexcept;
 
  private:
-  void write(int priority, LogShape shape, int line, const char* format,
-             va_list arguments) const noexcept;
+  [[gnu::format(printf, 5, 0)]] void write(int priority, LogShape shape, int line,
+                                           const char* format, va_list arguments) const noexcept;
 
   const char* module_;
 };

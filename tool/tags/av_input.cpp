@@ -85,7 +85,7 @@ int AvInput::bit_rate() const { return to_int(context_->bit_rate); }
 
 std::string AvInput::container(const std::string& path) const {
   const std::string names = context_->iformat->name;
-  const auto extension = extension_of(path);
+  auto extension = extension_of(path);
   const bool shared = ("," + names + ",").find("," + extension + ",") != std::string::npos;
   if (shared) return extension;
   // One reader serves the whole family; a file with a foreign extension is most likely this one.

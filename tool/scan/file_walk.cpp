@@ -125,7 +125,7 @@ void FileWalk::follow(const std::string& link) {
 }
 
 Found FileWalk::finish() {
-  // A followed folder may bring more links.
+  // NOLINTNEXTLINE(modernize-loop-convert): a followed folder may bring more links.
   for (std::size_t i = 0; i < links_.size(); ++i) follow(std::string(links_[i]));
   return std::move(found_);
 }

@@ -11,6 +11,7 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <charconv>
 #include <cstdlib>
 #include <fstream>
@@ -118,7 +119,7 @@ OpenFolder::~OpenFolder() {
 std::string OpenFolder::take_sample(const std::string& sample, const std::string& relative) const {
   const fs::path file = at(relative);
   fs::create_directories(file.parent_path());
-  fs::copy_file(fs::path(MEDIIDX_SAMPLE_LIBRARY) / sample, file);
+  fs::copy(fs::path(MEDIIDX_SAMPLE_LIBRARY) / sample, file, fs::copy_options::recursive);
   return file;
 }
 
@@ -132,6 +133,18 @@ std::string OpenFolder::write(const std::string& relative, const std::string& co
   return file;
 }
 
+namespace {
+
+pid_t parent_of(pid_t pid) {
+  std::ifstream in("/proc/" + std::to_string(pid) + "/status");
+  for (std::string line; std::getline(in, line);) {
+    if (line.starts_with("PPid:")) return std::stoi(line.substr(5));
+  }
+  return 0;
+}
+
+}  // namespace
+
 std::vector<pid_t> processes_with(const std::string& argument) {
   std::vector<pid_t> found;
   for (const auto& entry : fs::directory_iterator("/proc")) {
@@ -144,6 +157,9 @@ std::vector<pid_t> processes_with(const std::string& argument) {
     const auto wanted = '\0' + argument + '\0';
     if (words.find(wanted) != std::string::npos) found.push_back(pid);
   }
+  // A child that was forked just now still shows its parent's words.
+  const auto all = found;
+  std::erase_if(found, [&all](pid_t pid) { return std::ranges::count(all, parent_of(pid)) > 0; });
   return found;
 }
 

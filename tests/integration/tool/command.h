@@ -47,7 +47,8 @@ class OpenFolder {
   OpenFolder& operator=(const OpenFolder&) = delete;
   std::string at(const std::string& relative) const { return (path_ / relative).string(); }
   const std::filesystem::path& path() const { return path_; }
-  /// Copies a file of the sample library.
+  /// Copies a file or folder of the sample library; "" all of it. What is in a user's home, as the
+  /// library itself may be, belongs to that user.
   std::string take_sample(const std::string& sample, const std::string& relative) const;
   std::string write(const std::string& relative, const std::string& content) const;
 
@@ -55,7 +56,8 @@ class OpenFolder {
   std::filesystem::path path_;
 };
 
-/// Processes whose command line has this word as one of its arguments.
+/// Processes whose command line has this word as one of its arguments; of parent and child the
+/// parent.
 std::vector<pid_t> processes_with(const std::string& argument);
 
 }  // namespace mediidx::test

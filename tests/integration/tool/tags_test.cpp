@@ -8,15 +8,14 @@
 namespace mediidx::test {
 namespace {
 
-const std::string kSamples = MEDIIDX_SAMPLE_LIBRARY;
-
 /// The rows of the sample library: indexed once, read by every test.
 class TagsOf : public testing::Test {
  protected:
   static void SetUpTestSuite() {
     TestServer::get().fresh_database();
     folder_ = new OpenFolder;
-    const auto run = run_mediidx({"index", "--data-dir", folder_->at("d"), kSamples});
+    samples_ = folder_->take_sample("", "samples");
+    const auto run = run_mediidx({"index", "--data-dir", folder_->at("d"), samples_});
     ASSERT_TRUE(run.status == 0 || run.status == 3) << run.err;
   }
   static void TearDownTestSuite() { delete folder_; }
@@ -24,7 +23,7 @@ class TagsOf : public testing::Test {
   /// The values of these columns for one file.
   static Row row(const std::string& columns, const std::string& tables, const std::string& file) {
     const auto found = TestServer::get().rows("SELECT " + columns + " FROM " + tables +
-                                              " WHERE path = " + quoted(kSamples + "/" + file));
+                                              " WHERE path = " + quoted(samples_ + "/" + file));
     return found.size() == 1 ? found[0] : Row{std::to_string(found.size()) + " rows"};
   }
   static Row names(const std::string& file) {
@@ -39,6 +38,7 @@ class TagsOf : public testing::Test {
   }
 
   static inline OpenFolder* folder_ = nullptr;
+  static inline std::string samples_;
 };
 
 TEST_F(TagsOf, Flac) {

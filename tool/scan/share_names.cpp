@@ -36,8 +36,10 @@ std::string name_for_share(const Shares& shares, const std::string& folder) {
   const auto base = folder.substr(folder.rfind('/') + 1);
   std::string name(cut_at_character(base, kLongestName));
   for (int number = 2; is_taken(shares, name); ++number) {
-    const auto suffix = "-" + std::to_string(number);
-    name = std::string(cut_at_character(base, kLongestName - suffix.size())) + suffix;
+    std::string suffix = "-";
+    suffix += std::to_string(number);
+    name = cut_at_character(base, kLongestName - suffix.size());
+    name += suffix;
   }
   return name;
 }

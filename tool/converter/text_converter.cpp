@@ -4,6 +4,7 @@
 
 #include <strings.h>
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <stdexcept>
@@ -17,10 +18,24 @@ bool is_utf8(const std::string& charset) {
   return strcasecmp(charset.c_str(), "UTF-8") == 0 || strcasecmp(charset.c_str(), "UTF8") == 0;
 }
 
+constexpr std::string_view kUcs2 = "UCS-2";
+constexpr std::string_view kUtf16 = "UTF-16";
+
+bool begins_with(const std::string& charset, std::string_view name) {
+  return strncasecmp(charset.c_str(), name.data(), name.size()) == 0;
+}
+
+/// What is called UCS-2 is UTF-16 nowadays: iconv's UCS-2 stumbles over characters of two units.
+std::string source_name(const std::string& charset) {
+  if (!begins_with(charset, kUcs2)) return charset;
+  return std::string(kUtf16) + charset.substr(kUcs2.size());
+}
+
 }  // namespace
 
 TextConverter::TextConverter(const std::string& from, const std::string& to)
-    : descriptor_(iconv_open(to.c_str(), from.c_str())),
+    : descriptor_(iconv_open(to.c_str(), source_name(from).c_str())),
+      unit_(begins_with(source_name(from), kUtf16) ? 2 : 1),
       replacement_(is_utf8(to) ? "\xEF\xBF\xBD" : "?"),
       to_utf8_(is_utf8(to)) {
   // iconv_open reports failure by this value, which is no pointer that could be compared to null.
@@ -38,10 +53,13 @@ std::string TextConverter::run(std::string_view text, bool is_last) {
   char* from = input.data();
   std::size_t left = input.size();
   std::array<char, 4096> buffer;
-  while (left > 0) {
+  // At the end the converter hands out a letter that it held back for an accent to follow.
+  for (bool flushes = is_last; left > 0 || flushes;) {
     char* to = buffer.data();
     std::size_t room = buffer.size();
-    const auto converted = iconv(descriptor_, &from, &left, &to, &room);
+    if (left == 0) flushes = false;
+    const auto converted = left > 0 ? iconv(descriptor_, &from, &left, &to, &room)
+                                    : iconv(descriptor_, nullptr, nullptr, &to, &room);
     const int error = converted == static_cast<std::size_t>(-1) ? errno : 0;
     out.append(buffer.data(), to);
     if (error == EINVAL && !is_last) {
@@ -50,8 +68,9 @@ std::string TextConverter::run(std::string_view text, bool is_last) {
     }
     if (error == EILSEQ || error == EINVAL) {
       out += replacement_;
-      ++from;
-      --left;
+      const auto skipped = std::min(unit_, left);
+      from += skipped;
+      left -= skipped;
     }
   }
   take_mark_off(out);

@@ -7,6 +7,7 @@
 
 #include <iconv.h>
 
+#include <cstddef>
 #include <string>
 #include <string_view>
 
@@ -23,7 +24,7 @@ class TextConverter {
   TextConverter& operator=(const TextConverter&) = delete;
 
   std::string convert(std::string_view piece);
-  /// What an unfinished character at the end gives.
+  /// What is still held back, and what an unfinished character at the end gives.
   std::string finish();
 
  private:
@@ -31,6 +32,7 @@ class TextConverter {
   void take_mark_off(std::string& out);
 
   iconv_t descriptor_;
+  std::size_t unit_;         ///< Bytes to go on by after an invalid character.
   std::string rest_;         ///< The beginning of a character whose end is still to come.
   std::string replacement_;  ///< For bytes that are no character, in the target character set.
   bool at_beginning_ = true;

@@ -79,6 +79,17 @@ char* pass_on(int type, const char* sql, const Slots& slots, std::index_sequence
   return call(type, sql, slots[I]...);
 }
 
+constexpr std::size_t kMostArguments = 24;
+using Arguments = std::array<const char*, kMostArguments>;
+
+/// Those after the first unused one are never looked at.
+template <std::size_t... I>
+FILE* open_program(const char* program, const char* mode, const Arguments& arguments,
+                   std::index_sequence<I...>) {
+  static const auto call = behind<decltype(TLIBCPopen)>("TLIBCPopen");
+  return call(program, mode, arguments[0], arguments[I + 1]...);
+}
+
 /// The platform's text of a format whose values are filled in already.
 char* format_with(const char* function, const char* format, va_list& values) {
   char* text = nullptr;
@@ -172,10 +183,26 @@ TAVODB_EXPORT int TAVODBEscapeBackslashEX2(int databaseType, char* destination, 
       databaseType, destination, size, source);
 }
 
+TAVODB_EXPORT int TAVODBFetchRow(tavodb_result* result, std::uint32_t* row) {
+  if (fails("TAVODBFetchRow")) return -1;
+  return behind<decltype(TAVODBFetchRow)>("TAVODBFetchRow")(result, row);
+}
+
 TAVODB_EXPORT int EscapeConditionEX(tavodb_connection* conn, const char* condition,
                                     char* destination) {
   if (fails("EscapeConditionEX")) return -1;
   return behind<decltype(EscapeConditionEX)>("EscapeConditionEX")(conn, condition, destination);
+}
+
+TAVOCORE_EXPORT FILE* TLIBCPopen(const char* program, const char* mode, const char* arg1, ...) {
+  if (fails("TLIBCPopen")) return nullptr;
+  mediidx::test::Arguments arguments{arg1};
+  va_list values;
+  va_start(values, arg1);
+  for (std::size_t i = 0; arguments.at(i);) arguments.at(++i) = va_arg(values, const char*);
+  va_end(values);
+  return mediidx::test::open_program(program, mode, arguments,
+                                     std::make_index_sequence<mediidx::test::kMostArguments - 1>());
 }
 
 TAVOCORE_EXPORT char* TLIBCStrGet(const char* format, ...) {

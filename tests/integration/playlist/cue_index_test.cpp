@@ -4,21 +4,16 @@
 // Cue sheets through the requests, beside their audio files.
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <tavocore.h>
 
-#include <cstring>
-#include <memory>
+#include <filesystem>
 #include <string>
 #include <vector>
 
-#include "database.h"
+#include "indexed_sheet.h"
 #include "mediidx/request.h"
 
+namespace mediidx::test {
 namespace {
-
-using mediidx::test::logged_messages;
-using mediidx::test::Row;
-using testing::ElementsAre;
 
 constexpr const char* kSheet =
     "PERFORMER \"Band\"\nTITLE \"Album\"\nREM GENRE Rock\nREM DATE 1999\n"
@@ -26,66 +21,11 @@ constexpr const char* kSheet =
     "  TRACK 01 AUDIO\n    TITLE \"One\"\n    PERFORMER \"X\"\n    INDEX 01 00:00:00\n"
     "  TRACK 02 AUDIO\n    TITLE \"Two\"\n    PERFORMER \"Y\"\n    INDEX 01 03:00:00\n";
 
-class IndexedCueSheet : public mediidx::test::DatabaseTest {
+class IndexedCueSheet : public IndexedSheetTest {
  protected:
-  IndexedCueSheet() { root.index_everything("music", folder); }
-
-  std::string at(const std::string& name) { return folder + "/" + name; }
-
-  int add(const std::string& path, MEDIA_TABLE_TYPE type) {
-    auto info = std::make_unique<__tag_TAVO_MEDIA_INFO>();
-    std::strcpy(info->path, path.c_str());
-    if (type == MEDIA_TABLE_MUSIC) {
-      std::strcpy(info->title, "File");
-      std::strcpy(info->album, "Album");
-      std::strcpy(info->artist, "Band");
-      std::strcpy(info->video_codec, "flac");
-      std::strcpy(info->container_type, "flac");
-      info->duration = 600;
-      info->channel = 2;
-      info->frequency = 44100;
-      info->bitrate = 900000;
-    }
-    std::strcpy(info->date, "2020-01-02 03:04:05");
-    return TAVOMediaIndexAdd(info.get(), type);
-  }
-  int add_audio() {
-    root.write("volume1/music/a.flac", "x");
-    return add(at("a.flac"), MEDIA_TABLE_MUSIC);
-  }
   int add_sheet(const std::string& name = "album.cue", const std::string& content = kSheet) {
-    root.write("volume1/music/" + name, content);
-    return add(at(name), MEDIA_TABLE_PLAYLIST);
+    return IndexedSheetTest::add_sheet(name, content);
   }
-
-  /// Every row that the files have, ids aside.
-  std::vector<Row> catalogue(bool last_duration = true) {
-    const std::string duration =
-        last_duration ? "t.duration" : "CASE WHEN t.track = 2 THEN '' ELSE t.duration END";
-    return rows(
-        "SELECT t.path, t.title, t.title_sort, t.agg_genre, t.year, t.channel, t.frequency, "
-        "t.bitrate, " +
-        duration +
-        ", t.comment, t.track, t.container, t.codec, "
-        "t.is_virtual, t.has_virtual, t.date, a.album, a.album_artist, "
-        "a.from_album_artist, r.artist, c.composer, v.audio_offset, v.cue_sheet_path "
-        "FROM track t LEFT JOIN album_track a ON a.track = t.id "
-        "LEFT JOIN artist_track r ON r.track = t.id "
-        "LEFT JOIN composer_track c ON c.track = t.id "
-        "LEFT JOIN virtual_info_track v ON v.track = t.id "
-        "ORDER BY t.is_virtual, t.path, t.track");
-  }
-  long rows_left() {
-    long left = 0;
-    for (const char* table :
-         {"track", "genre_track", "composer_track", "artist_track", "album_track",
-          "virtual_info_track", "rating_track", "music", "virtual_music", "playlist"}) {
-      left += count(table);
-    }
-    return left;
-  }
-
-  std::string folder = root.make_folder("volume1/music");
 };
 
 TEST_F(IndexedCueSheet, BringsItsTracks) {
@@ -109,16 +49,18 @@ TEST_F(IndexedCueSheet, BringsItsTracks) {
 }
 
 TEST_F(IndexedCueSheet, ComesToTheSameBeforeItsAudioButForTheLastDuration) {
+  root.add_user("ann", 1001, root.at("home/ann"));
+  root.write("volume1/music/@eaDir/a.flac/TAVOAUDIO_SONG_RATING", "1001=5\n");
+  root.write("volume1/music/@eaDir/a.flac_2/TAVOAUDIO_SONG_RATING", "1001=3\n");
   EXPECT_EQ(add_audio(), 0);
   EXPECT_EQ(add_sheet(), 0);
-  const auto audio_first = catalogue(false);
+  const auto audio_first = catalogue(LastDurations::kLeftOut);
   const auto audio_first_whole = catalogue();
-  mediidx::test::TestServer::get().fresh_database();
-  TAVOMediaIndexDBClose();
+  start_anew();
 
   EXPECT_EQ(add_sheet(), 0);
   EXPECT_EQ(add_audio(), 0);
-  EXPECT_EQ(catalogue(false), audio_first);
+  EXPECT_EQ(catalogue(LastDurations::kLeftOut), audio_first);
 
   EXPECT_EQ(add_sheet(), 0);
   EXPECT_EQ(catalogue(), audio_first_whole);
@@ -165,8 +107,7 @@ TEST_F(IndexedCueSheet, ThatIsDeletedLeavesNoRowOfItsOwn) {
   EXPECT_EQ(add_audio(), 0);
   const auto alone = rows_left();
   EXPECT_EQ(add_sheet(), 0);
-  std::filesystem::remove(at("album.cue"));
-  EXPECT_EQ(TAVOMediaIndexDelete(at("album.cue").c_str()), 0);
+  EXPECT_EQ(remove("album.cue"), 0);
   EXPECT_EQ(rows_left(), alone);
 }
 
@@ -177,15 +118,32 @@ TEST_F(IndexedCueSheet, InADeletedFolderLeavesNoRow) {
   EXPECT_EQ(rows_left(), 0);
 }
 
+TEST_F(IndexedCueSheet, InADeletedFolderLeavesOtherFoldersAlone) {
+  EXPECT_EQ(add_audio("other/a.flac"), 0);
+  EXPECT_EQ(add_sheet("other/album.cue"), 0);
+  const auto others = catalogue();
+  EXPECT_EQ(add_audio("disc/a.flac"), 0);
+  EXPECT_EQ(add_sheet("disc/album.cue"), 0);
+  EXPECT_EQ(TAVOMediaIndexDirDelete(at("disc").c_str()), 0);
+  EXPECT_EQ(catalogue(), others);
+}
+
 TEST_F(IndexedCueSheet, OutlivesItsAudioFile) {
   EXPECT_EQ(add_audio(), 0);
   EXPECT_EQ(add_sheet(), 0);
-  std::filesystem::remove(at("a.flac"));
-  EXPECT_EQ(TAVOMediaIndexDelete(at("a.flac").c_str()), 0);
-  EXPECT_EQ(count("track", "is_virtual = 'TRUE'"), 2);
+  const auto cut_tracks = [this] {
+    return rows(
+        "SELECT (to_jsonb(t) || to_jsonb(v))::text FROM track t "
+        "JOIN virtual_info_track v ON v.track = t.id ORDER BY 1");
+  };
+  const auto before = cut_tracks();
+  ASSERT_EQ(before.size(), 2U);
+  EXPECT_EQ(remove("a.flac"), 0);
+  EXPECT_EQ(cut_tracks(), before);
+  EXPECT_EQ(count("virtual_music"), 2);
   EXPECT_EQ(count("track", "is_virtual = 'FALSE'"), 0);
-  std::filesystem::remove(at("album.cue"));
-  EXPECT_EQ(TAVOMediaIndexDelete(at("album.cue").c_str()), 0);
+  EXPECT_EQ(count("music"), 0);
+  EXPECT_EQ(remove("album.cue"), 0);
   EXPECT_EQ(rows_left(), 0);
 }
 
@@ -194,10 +152,18 @@ TEST_F(IndexedCueSheet, WithALongPathKeepsCutRowsAfterItsDelete) {
   const auto name = std::string(250, 'n') + ".cue";
   EXPECT_EQ(add_sheet(name), 0);
   EXPECT_EQ(value("SELECT max(length(comment)) FROM virtual_music"), "254");
-  std::filesystem::remove(at(name));
-  EXPECT_EQ(TAVOMediaIndexDelete(at(name).c_str()), 0);
+  EXPECT_EQ(remove(name), 0);
   EXPECT_EQ(count("virtual_music"), 2);
   EXPECT_EQ(count("track"), 0);
+}
+
+TEST_F(IndexedCueSheet, WithAPathThatJustFitsLeavesNoRowAfterItsDelete) {
+  const auto name = std::string(246 - at(".cue").size(), 'n') + ".cue";
+  ASSERT_EQ(at(name).size(), 246U);
+  EXPECT_EQ(add_sheet(name), 0);
+  EXPECT_EQ(value("SELECT max(length(comment)) FROM virtual_music"), "254");
+  EXPECT_EQ(remove(name), 0);
+  EXPECT_EQ(rows_left(), 0);
 }
 
 TEST_F(IndexedCueSheet, GivesItsTracksRatingsOfTheirOwn) {
@@ -222,6 +188,38 @@ TEST_F(IndexedCueSheet, OfFilesOutsideTheIndexBringsNoTracks) {
   EXPECT_EQ(count("virtual_music"), 1);
 }
 
+TEST_F(IndexedCueSheet, InEachCharacterSetKeepsItsTitles) {
+  const struct {
+    const char* code;
+    const char* charset;
+    const char* title;
+  } cases[] = {
+      {"enu", "CP1252", "Les été français à l'hôtel"},
+      {"jpn", "CP932", "日本語の歌のなまえはなんですか"},
+      {"chs", "CP936", "中文歌曲的名字是什么我们不知道"},
+      {"krn", "CP949", "한국어 노래의 제목은 무엇입니까"},
+      {"cht", "CP950", "中文歌曲的名字是什麼我們不知道這個問題"},
+      {"plk", "CP1250", "Zażółć gęślą jaźń, mój miły, w Łodzi świeci słońce"},
+      {"rus", "CP1251", "Песня о том, как мы пошли домой и потом"},
+  };
+  for (const auto& test : cases) {
+    SCOPED_TRACE(test.charset);
+    const auto content = in_charset(std::string("FILE a.flac WAVE\r\nTRACK 01 AUDIO\r\nTITLE \"") +
+                                        test.title + "\"\r\nINDEX 01 00:00:00\r\n",
+                                    test.charset);
+    set_code_page(test.code);
+    EXPECT_EQ(add_sheet("album.cue", content), 0);
+    EXPECT_EQ(value("SELECT title FROM virtual_music"), test.title);
+    EXPECT_EQ(value("SELECT title FROM track"), test.title);
+    // No one can tell without the code page, and the bytes are no UTF-8.
+    set_code_page("");
+    EXPECT_EQ(add_sheet("album.cue", content), -1);
+    EXPECT_EQ(count("playlist"), 1);
+    EXPECT_EQ(count("virtual_music"), 0);
+    EXPECT_EQ(logged_messages().back(), "Failed to save shared virtual files");
+  }
+}
+
 TEST_F(IndexedCueSheet, InAPersonalLibraryLivesInTheCatalogueOnly) {
   root.add_user("ann", 1001, root.at("home/ann"));
   folder = root.make_folder("home/ann/music");
@@ -234,10 +232,8 @@ TEST_F(IndexedCueSheet, InAPersonalLibraryLivesInTheCatalogueOnly) {
 }
 
 TEST_F(IndexedCueSheet, OfOneFilePerTrackHasTrueDurations) {
-  root.write("volume1/music/1.flac", "x");
-  root.write("volume1/music/2.flac", "x");
-  EXPECT_EQ(add(at("1.flac"), MEDIA_TABLE_MUSIC), 0);
-  EXPECT_EQ(add(at("2.flac"), MEDIA_TABLE_MUSIC), 0);
+  EXPECT_EQ(add_audio("1.flac"), 0);
+  EXPECT_EQ(add_audio("2.flac"), 0);
   EXPECT_EQ(add_sheet("album.cue",
                       "FILE 1.flac WAVE\nTRACK 01 AUDIO\nINDEX 01 00:00:00\nFILE 2.flac WAVE\n"
                       "TRACK 02 AUDIO\nINDEX 00 00:00:00\nINDEX 01 00:02:00\n"),
@@ -247,3 +243,4 @@ TEST_F(IndexedCueSheet, OfOneFilePerTrackHasTrueDurations) {
 }
 
 }  // namespace
+}  // namespace mediidx::test

@@ -3,20 +3,28 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
+#include <chrono>
 #include <cstdlib>
 #include <memory>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "database.h"
+#include "integration/database/faults.h"
 #include "mediidx/cue_sheet.h"
 #include "mediidx/playlist.h"
 
 namespace {
 
 using mediidx::test::clear_log;
+using mediidx::test::Failing;
 using mediidx::test::logged;
 using mediidx::test::quoted;
+#ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
+using mediidx::test::Allocator;
+using mediidx::test::FailingAllocation;
+#endif
 using testing::ElementsAre;
 using testing::IsEmpty;
 
@@ -66,6 +74,19 @@ class CueSheet : public mediidx::test::DatabaseTest {
     std::vector<std::string> all;
     for (const auto& track : tracks) all.emplace_back(track.comment);
     return all;
+  }
+
+  /// Waits until so many sessions are open on the database, besides the one that asks: the server
+  /// ends them after their client has left.
+  bool open_sessions_become(long expected) {
+    const auto end = std::chrono::steady_clock::now() + std::chrono::seconds(30);
+    while (count("pg_stat_activity",
+                 "datname = 'mediaserver' AND pid <> pg_backend_pid() "
+                 "AND backend_type = 'client backend'") != expected) {
+      if (std::chrono::steady_clock::now() > end) return false;
+      std::this_thread::sleep_for(std::chrono::milliseconds(5));
+    }
+    return true;
   }
 
   void index_audio(const std::string& name, int duration_s) {
@@ -185,6 +206,111 @@ TEST_F(CueSheet, FailsWhenTheLookUpFails) {
   EXPECT_EQ(result, 0);
 }
 
+TEST_F(CueSheet, FailsWhenTheRowCannotBeFetched) {
+  index_audio("a.flac", 600);
+  EXPECT_TRUE(parse({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 05:00:00"}));
+  {
+    const Failing fetch("TAVODBFetchRow");
+    EXPECT_EQ(parser.ParseCommand("FILE b.flac WAVE", sheet.c_str()), 0);
+  }
+  ASSERT_EQ(logged().size(), 1U);
+  EXPECT_EQ(logged()[0].text, "mediidx_playlist_cue_parse:266 Failed to fetch row");
+  EXPECT_EQ(logged()[0].priority, 3);
+  EXPECT_TRUE(open_sessions_become(0));
+}
+
+TEST_F(CueSheet, FailsWhenItsStatementCannotBeBuilt) {
+  index_audio("a.flac", 600);
+  EXPECT_TRUE(parse({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 05:00:00"}));
+  const Failing fill("TAVODBEscapeStringEX3");
+  EXPECT_THAT(output(), IsEmpty());
+  EXPECT_EQ(result, 0);
+  EXPECT_TRUE(open_sessions_become(0));
+}
+
+#ifdef MEDIIDX_ALLOCATIONS_CAN_FAIL
+TEST_F(CueSheet, KeepsTheNodesMadeBeforeMemoryRanOut) {
+  EXPECT_TRUE(parse({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00", "TRACK 02 AUDIO",
+                     "INDEX 01 03:00:00", "TRACK 03 AUDIO", "INDEX 01 04:00:00"}));
+  std::vector<__tag_TAVO_MEDIA_INFO> tracks;
+  {
+    const FailingAllocation calloc(Allocator::kCalloc, sizeof(_PLAYLIST_REC), 3);
+    tracks = output();
+  }
+  EXPECT_EQ(result, 0);
+  EXPECT_THAT(starts(tracks), ElementsAre("00:00:00", "03:00:00"));
+  ASSERT_EQ(logged().size(), 1U);
+  EXPECT_EQ(logged()[0].text, "mediidx_playlist_cue_parse:452 Failed to calloc.");
+}
+#endif
+
+TEST_F(CueSheet, IsConnectedOnlyWhileItLooksUp) {
+  index_audio("a.flac", 600);
+  EXPECT_TRUE(parse({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00"}));
+  EXPECT_TRUE(parse({"FILE b.flac WAVE", "TRACK 02 AUDIO", "INDEX 01 00:00:00"}));
+  EXPECT_EQ(mediidx::test::last_connect(),
+            (mediidx::test::ConnectArguments{"<null>", "postgres", "<null>", "mediaserver"}));
+  EXPECT_TRUE(open_sessions_become(0));
+
+  auto* const conn = parser.PersonalLibraryDBConnect();
+  ASSERT_NE(conn, nullptr);
+  EXPECT_EQ(parser.PersonalLibraryDBConnect(), conn);
+  EXPECT_TRUE(open_sessions_become(1));
+  parser.PersonalLibraryDBClose();
+  parser.PersonalLibraryDBClose();
+  EXPECT_TRUE(open_sessions_become(0));
+}
+
+// The last INDEX line of a track counts, whatever its number.
+TEST_F(CueSheet, EndsATrackAtAFurtherIndexOfTheNextOne) {
+  const auto tracks = tracks_of({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00",
+                                 "TRACK 02 AUDIO", "INDEX 01 03:00:00", "INDEX 02 04:00:00"});
+  EXPECT_EQ(tracks[0].duration, 240);
+  EXPECT_STREQ(tracks[1].comment, "03:00:00");
+}
+
+TEST_F(CueSheet, LeavesATrackOfAnotherFileAlone) {
+  index_audio("a.flac", 100);
+  const auto tracks =
+      tracks_of({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00", "TRACK 02 AUDIO",
+                 "INDEX 00 01:30:00", "FILE b.flac WAVE", "INDEX 01 00:00:00", "INDEX 02 00:40:00",
+                 "TRACK 03 AUDIO", "INDEX 01 02:00:00"});
+  EXPECT_EQ(tracks[0].duration, 90);
+  EXPECT_EQ(tracks[1].duration, 120);
+  EXPECT_EQ(tracks[1].path, folder + "/b.flac");
+}
+
+TEST_F(CueSheet, WithoutAPositionOfItsLastTrackIsNotClosedByAFile) {
+  rows("DROP TABLE music");
+  EXPECT_TRUE(parse({"FILE a.flac WAVE", "TRACK 01 AUDIO", "FILE b.flac WAVE"}));
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+TEST_F(CueSheet, TakesGenreAndYearFromAnywhere) {
+  const auto tracks = tracks_of({"REM GENRE Pop", "FILE a.flac WAVE", "TRACK 01 AUDIO",
+                                 "INDEX 01 00:00:00", "REM GENRE Rock", "REM DATE 1999",
+                                 "TRACK 02 AUDIO", "INDEX 01 01:00:00", "REM COMMENT x"});
+  for (const auto& track : tracks) {
+    EXPECT_STREQ(track.genre, "Rock");
+    EXPECT_EQ(track.year, 1999);
+  }
+}
+
+TEST_F(CueSheet, WithoutGenreAndYearGivesNone) {
+  const auto tracks = tracks_of({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00"});
+  EXPECT_STREQ(tracks[0].genre, "");
+  EXPECT_EQ(tracks[0].year, 0);
+}
+
+TEST_F(CueSheet, KnowsItsCommandsInCapitalsOnly) {
+  const auto tracks =
+      tracks_of({"FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00", "track 02 AUDIO",
+                 "index 01 01:00:00", "Title x", "rem date 1999"});
+  ASSERT_EQ(tracks.size(), 1U);
+  EXPECT_STREQ(tracks[0].title, "");
+  EXPECT_EQ(tracks[0].year, 0);
+}
+
 TEST_F(CueSheet, RebuildsQuotedValuesWithSingleBlanks) {
   const auto tracks = tracks_of({"TITLE \"Live  at   Home\"", "FILE a.flac WAVE", "TRACK 01 AUDIO",
                                  "TITLE Live  at   Home", "INDEX 01 00:00:00"});
@@ -260,10 +386,49 @@ TEST_F(CueSheet, IgnoresAnIndexBeforeTheFirstTrack) {
 }
 
 TEST_F(CueSheet, KeepsAValueThatALineWithoutOneLeavesAlone) {
-  const auto tracks = tracks_of({"TITLE Album", "TITLE", "REM DATE 1999", "REM DATE",
-                                 "FILE a.flac WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00"});
+  const auto tracks = tracks_of({"TITLE Album",
+                                 "TITLE",
+                                 "PERFORMER Band",
+                                 "PERFORMER",
+                                 "SONGWRITER Writer",
+                                 "SONGWRITER",
+                                 "REM GENRE Rock",
+                                 "REM GENRE",
+                                 "REM DATE 1999",
+                                 "REM DATE",
+                                 "FILE a.flac WAVE",
+                                 "FILE",
+                                 "TRACK 01 AUDIO",
+                                 "TRACK",
+                                 "TITLE One",
+                                 "TITLE",
+                                 "PREGAP 00:01:00",
+                                 "PREGAP",
+                                 "INDEX 01 00:00:00",
+                                 "INDEX 01",
+                                 "FILE",
+                                 "POSTGAP 00:02:00",
+                                 "POSTGAP",
+                                 "TRACK 02 AUDIO",
+                                 "INDEX 01 01:00:00"});
+  ASSERT_EQ(tracks.size(), 2U);
   EXPECT_STREQ(tracks[0].album, "Album");
+  EXPECT_STREQ(tracks[0].album_artist, "Band");
+  EXPECT_STREQ(tracks[0].composer, "Writer");
+  EXPECT_STREQ(tracks[0].genre, "Rock");
   EXPECT_EQ(tracks[0].year, 1999);
+  EXPECT_STREQ(tracks[0].title, "One");
+  EXPECT_STREQ(tracks[0].comment, "00:01:00");
+  EXPECT_EQ(tracks[0].duration, 57);
+  EXPECT_EQ(tracks[1].path, folder + "/a.flac");
+}
+
+// The last word of a FILE line is its type, whatever it says.
+TEST_F(CueSheet, TakesANameOfOneWordWithoutATypeOnly) {
+  const auto tracks = tracks_of({"FILE a.flac", "TRACK 01 AUDIO", "INDEX 01 00:00:00",
+                                 "FILE \"b c.flac\"", "TRACK 02 AUDIO", "INDEX 01 00:00:00"});
+  ASSERT_EQ(tracks.size(), 1U);  // what is left of the second name is no music file
+  EXPECT_EQ(tracks[0].path, folder + "/a.flac");
 }
 
 TEST_F(CueSheet, CutsATitleAtTheBorderOfACharacter) {
@@ -284,6 +449,51 @@ TEST_F(CueSheet, ReadsAFileNamedWithQuotesInItsNameAsOneName) {
   const auto tracks =
       tracks_of({"FILE \"it's; DROP.flac\" WAVE", "TRACK 01 AUDIO", "INDEX 01 00:00:00"});
   EXPECT_EQ(tracks[0].duration, 60);
+}
+
+/// The parser's fields as its callers are built against them.
+struct ParserFields {
+  tavodb_connection* connection;
+  bool is_cue_sheet;
+  __tag_TAVO_MEDIA_INFO album;
+  std::vector<__tag_TAVO_MEDIA_INFO> tracks;
+  std::string current_file;
+  std::string pregap;
+  std::string postgap;
+};
+static_assert(sizeof(MediaInfoCueParser) == sizeof(ParserFields));
+
+TEST(CueParser, HoldsItsFieldsInTheOrderThatItsCallersKnow) {
+  MediaInfoCueParser parser;
+  const auto& fields = reinterpret_cast<const ParserFields&>(parser);
+  EXPECT_EQ(fields.connection, nullptr);
+  EXPECT_FALSE(fields.is_cue_sheet);
+  EXPECT_STREQ(fields.album.title, "");
+  for (const char* line : {"TITLE Album", "FILE a.flac WAVE", "TRACK 07 AUDIO", "PREGAP 00:02:00",
+                           "POSTGAP 00:03:00"}) {
+    EXPECT_EQ(parser.ParseCommand(line, "/m/a.cue"), 1);
+  }
+  EXPECT_TRUE(fields.is_cue_sheet);
+  EXPECT_STREQ(fields.album.title, "Album");
+  ASSERT_EQ(fields.tracks.size(), 1U);
+  EXPECT_EQ(fields.tracks[0].track, 7);
+  EXPECT_EQ(fields.current_file, "/m/a.flac");
+  EXPECT_EQ(fields.pregap, "00:02:00");
+  EXPECT_EQ(fields.postgap, "00:03:00");
+}
+
+TEST(CueParser, KeepsAPostgapUntilTheNextStart) {
+  MediaInfoCueParser parser;
+  const auto& fields = reinterpret_cast<const ParserFields&>(parser);
+  for (const char* line :
+       {"TRACK 01 AUDIO", "POSTGAP 00:03:00", "TRACK 02 AUDIO", "INDEX 00 00:10:00"}) {
+    EXPECT_EQ(parser.ParseCommand(line, "/m/a.cue"), 1);
+  }
+  EXPECT_EQ(fields.postgap, "00:03:00");
+  EXPECT_EQ(fields.tracks[0].duration, 7);
+  EXPECT_EQ(parser.ParseCommand("INDEX 01 00:12:00", "/m/a.cue"), 1);
+  EXPECT_EQ(fields.postgap, "");
+  EXPECT_EQ(fields.tracks[0].duration, 9);
 }
 
 TEST(CueParser, RebuildsAValueFromItsTokens) {

@@ -4,56 +4,26 @@
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
-#include <iconv.h>
-#include <tavocore.h>
 
-#include <cerrno>
-#include <memory>
+#include <filesystem>
 #include <string>
 #include <vector>
 
-#include "database.h"
-#include "mediidx/database.h"
+#include "indexed_sheet.h"
+#include "integration/database/faults.h"
 #include "mediidx/playlist.h"
-#include "mediidx/request.h"
 
 namespace {
 
-using mediidx::test::clear_log;
+namespace fs = std::filesystem;
+using mediidx::test::Failing;
+using mediidx::test::in_charset;
 using mediidx::test::logged;
-using mediidx::test::quoted;
-using mediidx::test::Row;
 using testing::ElementsAre;
 using testing::IsEmpty;
 
-std::string converted(const std::string& text, const char* to) {
-  iconv_t descriptor = iconv_open(to, "UTF-8");
-  std::string in = text;
-  std::string out(text.size() * 4 + 16, '\0');
-  char* from = in.data();
-  char* into = out.data();
-  std::size_t left = in.size();
-  std::size_t room = out.size();
-  if (iconv(descriptor, &from, &left, &into, &room) == static_cast<std::size_t>(-1)) {
-    ADD_FAILURE() << "no " << to << " for " << text;
-  }
-  iconv_close(descriptor);
-  out.resize(out.size() - room);
-  return out;
-}
-
-class CueFile : public mediidx::test::DatabaseTest {
+class CueFile : public mediidx::test::IndexedSheetTest {
  protected:
-  CueFile() {
-    root.index_everything("music", folder);
-    root.make_link("usr/bin/php", MEDIIDX_CONVERTER);
-    clear_log();
-  }
-
-  void set_code_page(const std::string& code) {
-    root.write("etc/tavoinfo.conf", "codepage=\"" + code + "\"\n");
-  }
-
   std::string write_sheet(const std::string& content) {
     return root.write("volume1/music/album.cue", content);
   }
@@ -73,7 +43,12 @@ class CueFile : public mediidx::test::DatabaseTest {
            "\"\r\n    INDEX 01 00:00:00\r\n";
   }
 
-  std::string folder = root.make_folder("volume1/music");
+  /// Puts a shell script where the converter stands.
+  void replace_converter(const std::string& script) {
+    fs::remove(root.at("usr/bin/php"));
+    fs::permissions(root.write("usr/bin/php", "#!/bin/sh\n" + script), fs::perms::owner_all);
+  }
+
   int result = 1;
 };
 
@@ -119,7 +94,6 @@ TEST_F(CueFile, WithoutAListOrAPathFails) {
 }
 
 TEST_F(CueFile, WithAByteOrderMarkBeforeFileIsUnderstood) {
-  // No converter: the file is read as it is.
   root.write("etc/tavoinfo.conf", "codepage=utf8\n");
   const auto tracks =
       read(write_sheet("\xEF\xBB\xBF"
@@ -129,20 +103,22 @@ TEST_F(CueFile, WithAByteOrderMarkBeforeFileIsUnderstood) {
 }
 
 TEST_F(CueFile, OfPlainAsciiComesThroughTheConverter) {
+  replace_converter("touch " + root.at("started") + "\nexec " + MEDIIDX_CONVERTER + " \"$@\"\n");
   const auto tracks = read(write_sheet(sheet_with_title("Song")));
   ASSERT_EQ(tracks.size(), 1U);
   EXPECT_STREQ(tracks[0].title, "Song");
+  EXPECT_TRUE(root.exists("started"));
 }
 
 TEST_F(CueFile, IsReadDirectlyWhenTheConverterCannotBeStarted) {
-  std::filesystem::remove(root.at("usr/bin/php"));
+  fs::remove(root.at("usr/bin/php"));
   const auto tracks = read(write_sheet(sheet_with_title("Song")));
   ASSERT_EQ(tracks.size(), 1U);
   EXPECT_STREQ(tracks[0].title, "Song");
 }
 
 TEST_F(CueFile, IsReadUpToALineThatIsTooLong) {
-  std::filesystem::remove(root.at("usr/bin/php"));
+  fs::remove(root.at("usr/bin/php"));
   const auto head = sheet_with_title("One");
   const auto tail = std::string("TRACK 02 AUDIO\nINDEX 01 01:00:00\n");
   EXPECT_EQ(read(write_sheet(head + "REM " + std::string(1019, 'x') + "\n" + tail)).size(), 2U);
@@ -159,7 +135,7 @@ TEST_F(CueFile, ThatIsConvertedGivesALongLineInPieces) {
 
 TEST_F(CueFile, LogsTheLineThatFailed) {
   rows("DROP TABLE music");
-  std::filesystem::remove(root.at("usr/bin/php"));
+  fs::remove(root.at("usr/bin/php"));
   const std::string lines = "FILE a.flac WAVE\nTRACK 01 AUDIO\nINDEX 01 00:00:00\n";
   read(write_sheet(lines + "FILE b.flac WAVE\n"));
   EXPECT_EQ(result, -1);
@@ -174,6 +150,60 @@ TEST_F(CueFile, LogsTheConvertedLineThatFailed) {
   EXPECT_EQ(result, -1);
   EXPECT_EQ(logged().back().text,
             "mediidx_playlist_cue_parse:498 Failed to parse command [FILE b.flac WAVE\n]");
+}
+
+TEST_F(CueFile, StartsTheConverterWithItsWholeCommandLine) {
+  replace_converter("printf '%s\\n' \"$@\" >" + root.at("arguments") + "\nexec " +
+                    MEDIIDX_CONVERTER + " \"$@\"\n");
+  set_code_page("jpn");
+  const auto path = write_sheet(in_charset(sheet_with_title("日本語の歌"), "CP932"));
+  EXPECT_EQ(read(path).size(), 1U);
+  EXPECT_EQ(root.read("arguments"),
+            "-n\n-d\nextension_dir=/lib/php/modules\n-d\nextension=iconv.so\n"
+            "/var/packages/Cantivo/target/scripts/phpiconv\n--from\nCP932\n--to\nUTF-8\n" +
+                path + "\n");
+}
+
+TEST_F(CueFile, OfUtf8NeedsNoConverter) {
+  replace_converter("touch " + root.at("started") + "\n");
+  const auto sheet = sheet_with_title("日本語の歌 Été");
+  EXPECT_EQ(read(write_sheet(sheet)).size(), 1U);
+  EXPECT_EQ(read(write_sheet("\xEF\xBB\xBF" + sheet)).size(), 1U);
+  EXPECT_FALSE(root.exists("started"));
+}
+
+TEST_F(CueFile, KeepsItsByteOrderMarkBeforeOtherLinesThanTheFirst) {
+  const auto tracks =
+      read(write_sheet("REM \xC3\xA9\n\xEF\xBB\xBF"
+                       "TITLE Lost\nFILE a.flac WAVE\nTRACK 01 AUDIO\n"
+                       "INDEX 01 00:00:00\n"));
+  ASSERT_EQ(tracks.size(), 1U);
+  EXPECT_STREQ(tracks[0].album, "");
+}
+
+TEST_F(CueFile, IsReadDirectlyAfterAConversionWithoutATrack) {
+  replace_converter("printf 'TITLE \"Converted\"\\nPERFORMER Band\\n'\n");
+  const auto tracks =
+      read(write_sheet("TITLE \"Direct\"\nFILE a.flac WAVE\nTRACK 01 AUDIO\nINDEX 01 00:00:00\n"));
+  ASSERT_EQ(tracks.size(), 1U);
+  EXPECT_STREQ(tracks[0].album, "Direct");
+  EXPECT_STREQ(tracks[0].album_artist, "Band");  // what was converted stays
+}
+
+TEST_F(CueFile, IsReadDirectlyWhenItsCharsetCannotBeConverted) {
+  replace_converter("exec " + std::string(MEDIIDX_CONVERTER) +
+                    " script --from NO-SUCH-SET --to UTF-8 \"${11}\" 2>/dev/null\n");
+  EXPECT_EQ(read(write_sheet(sheet_with_title("Song"))).size(), 1U);
+}
+
+TEST_F(CueFile, FailsSilentlyWhenNoConverterCanBeAskedFor) {
+  const auto path = write_sheet(sheet_with_title("Song"));
+  const Failing open("TLIBCPopen");
+  const auto tracks = read(path);
+  EXPECT_EQ(open.calls(), 1);
+  EXPECT_THAT(tracks, IsEmpty());
+  EXPECT_EQ(result, -1);
+  EXPECT_THAT(logged(), IsEmpty());
 }
 
 struct CharsetCase {
@@ -192,7 +222,7 @@ TEST_P(CueFileInACharset, GivesItsTitlesInUtf8) {
   const auto& param = GetParam();
   if (*param.code_page) set_code_page(param.code_page);
   const auto content = std::string(param.mark, param.mark_size) +
-                       converted(sheet_with_title(param.title), param.charset);
+                       in_charset(sheet_with_title(param.title), param.charset);
 
   const auto tracks = read(write_sheet(content));
 
@@ -208,39 +238,56 @@ constexpr const char* kChinese = "中文歌曲的名字是什么我们不知道"
 constexpr const char* kTraditional = "中文歌曲的名字是什麼我們不知道這個問題";
 constexpr const char* kKorean = "한국어 노래의 제목은 무엇입니까";
 constexpr const char* kPolish = "Zażółć gęślą jaźń, mój miły, w Łodzi świeci słońce";
+constexpr const char* kLongRussian =
+    "Песня о том, как мы пошли домой и потом долго сидели у реки, пока не взошла луна";
 constexpr const char* kRussian = "Песня о том, как мы пошли домой и потом";
 
 INSTANTIATE_TEST_SUITE_P(
     Cases, CueFileInACharset,
-    testing::Values(CharsetCase{"Cp1252", "CP1252", "enu", kFrench, "", 0},
-                    CharsetCase{"Cp1252Danish", "CP1252", "dan", "Rødgrød med fløde på", "", 0},
-                    CharsetCase{"Cp932", "CP932", "jpn", kJapanese, "", 0},
-                    CharsetCase{"Cp936", "CP936", "chs", kChinese, "", 0},
-                    CharsetCase{"Cp949", "CP949", "krn", kKorean, "", 0},
-                    CharsetCase{"Cp950", "CP950", "cht", kTraditional, "", 0},
-                    CharsetCase{"Cp1250", "CP1250", "plk", kPolish, "", 0},
-                    CharsetCase{"Cp1251", "CP1251", "rus", kRussian, "", 0},
-                    CharsetCase{"Ucs2BigEndian", "UCS-2BE", "", kFrench, "\xFE\xFF", 2},
-                    CharsetCase{"Ucs2LittleEndian", "UCS-2LE", "", kRussian, "\xFF\xFE", 2},
-                    CharsetCase{"Ucs2WithACodePage", "UCS-2LE", "jpn", kJapanese, "\xFF\xFE", 2},
-                    CharsetCase{"Utf8", "UTF-8", "", kJapanese, "", 0},
-                    CharsetCase{"Utf8WithACodePage", "UTF-8", "enu", kFrench, "", 0},
-                    CharsetCase{"Utf8WithAMark", "UTF-8", "", kKorean, "\xEF\xBB\xBF", 3},
-                    CharsetCase{"Utf8WithAMarkAndACodePage", "UTF-8", "rus", kRussian,
-                                "\xEF\xBB\xBF", 3}),
+    testing::Values(
+        CharsetCase{"Cp1252", "CP1252", "enu", kFrench, "", 0},
+        CharsetCase{"Cp1252Danish", "CP1252", "dan", "Rødgrød med fløde på", "", 0},
+        CharsetCase{"Cp932", "CP932", "jpn", kJapanese, "", 0},
+        CharsetCase{"Cp936", "CP936", "chs", kChinese, "", 0},
+        CharsetCase{"Cp949", "CP949", "krn", kKorean, "", 0},
+        CharsetCase{"Cp950", "CP950", "cht", kTraditional, "", 0},
+        CharsetCase{"Cp1250", "CP1250", "plk", kPolish, "", 0},
+        CharsetCase{"Cp1251", "CP1251", "rus", kRussian, "", 0},
+        CharsetCase{"Ucs2BigEndian", "UCS-2BE", "", kFrench, "\xFE\xFF", 2},
+        CharsetCase{"Ucs2LittleEndian", "UCS-2LE", "", kRussian, "\xFF\xFE", 2},
+        CharsetCase{"Ucs2WithACodePage", "UCS-2LE", "jpn", kJapanese, "\xFF\xFE", 2},
+        CharsetCase{"Ucs2BigEndianWithACodePage", "UCS-2BE", "rus", kRussian, "\xFE\xFF", 2},
+        CharsetCase{"Ucs2WithAnUnknownCodePage", "UCS-2LE", "nosuch", kPolish, "\xFF\xFE", 2},
+        CharsetCase{"Utf8", "UTF-8", "", kJapanese, "", 0},
+        CharsetCase{"Cp1254", "CP1254", "trk", "Şarkının adı güneş ığdır", "", 0},
+        CharsetCase{"Cp1250Hungarian", "CP1250", "hun",
+                    "Árvíztűrő tükörfúrógép és a hosszú őszi esték", "", 0},
+        CharsetCase{"Cp1250Czech", "CP1250", "csy", "Příliš žluťoučký kůň úpěl ďábelské ódy", "",
+                    0},
+        CharsetCase{"Koi8", "KOI8-R", "rus", kRussian, "", 0},
+        CharsetCase{"Ibm866", "IBM866", "rus", kRussian, "", 0},
+        CharsetCase{"MacCyrillic", "MACCYRILLIC", "rus", kLongRussian, "", 0},
+        CharsetCase{"Utf8UnderCodePageUtf8", "UTF-8", "utf8", kFrench, "", 0},
+        CharsetCase{"Utf8WithACodePage", "UTF-8", "enu", kFrench, "", 0},
+        CharsetCase{"Utf8WithAMark", "UTF-8", "", kKorean, "\xEF\xBB\xBF", 3},
+        CharsetCase{"Utf8WithAMarkAndACodePage", "UTF-8", "rus", kRussian, "\xEF\xBB\xBF", 3}),
     [](const auto& test) { return test.param.name; });
 
 class LegacyCueFile : public CueFile, public testing::WithParamInterface<CharsetCase> {};
 
 TEST_P(LegacyCueFile, IsReadAsItIsWithoutACodePageWhenEncaCannotTell) {
-  const auto content = converted(sheet_with_title(GetParam().title), GetParam().charset);
+  const auto content = in_charset(sheet_with_title(GetParam().title), GetParam().charset);
   const auto tracks = read(write_sheet(content));
   ASSERT_EQ(tracks.size(), 1U);
-  EXPECT_EQ(std::string(tracks[0].title), converted(GetParam().title, GetParam().charset));
+  EXPECT_EQ(std::string(tracks[0].title), in_charset(GetParam().title, GetParam().charset));
 }
 
 INSTANTIATE_TEST_SUITE_P(Cases, LegacyCueFile,
                          testing::Values(CharsetCase{"Cp1252", "CP1252", "", kFrench, "", 0},
+                                         CharsetCase{"Cp932", "CP932", "", kJapanese, "", 0},
+                                         CharsetCase{"Cp936", "CP936", "", kChinese, "", 0},
+                                         CharsetCase{"Cp949", "CP949", "", kKorean, "", 0},
+                                         CharsetCase{"Cp950", "CP950", "", kTraditional, "", 0},
                                          CharsetCase{"Cp1250", "CP1250", "", kPolish, "", 0},
                                          CharsetCase{"Cp1251", "CP1251", "", kRussian, "", 0}),
                          [](const auto& test) { return test.param.name; });

@@ -124,6 +124,33 @@ TEST_F(IndexingACueSheet, ComesAfterItsAudioFile) {
   EXPECT_EQ(value("SELECT duration FROM track WHERE is_virtual = 'TRUE'"), "1.000000");
 }
 
+TEST_F(IndexingACueSheet, BeforeItsAudioFileComesToTheSameInTheEnd) {
+  const auto catalogue = [this] {
+    return rows(
+        "SELECT (to_jsonb(t) - 'id')::text, to_jsonb(a) - 'track', to_jsonb(v) - 'track' "
+        "FROM track t LEFT JOIN album_track a ON a.track = t.id "
+        "LEFT JOIN virtual_info_track v ON v.track = t.id ORDER BY 1");
+  };
+  media.write("a.cue", sheet("One"));
+  output({"index", media.path()});
+  media.write("a.wav", silence());
+  output({"index", media.path()});
+  const auto sheet_first = catalogue();
+  ASSERT_EQ(sheet_first.size(), 3U);
+
+  TestServer::get().fresh_database();
+  output({"index", media.path()});
+  EXPECT_EQ(catalogue(), sheet_first);
+}
+
+TEST_F(IndexingACueSheet, OfALegacyCharacterSetNeedsTheCodePage) {
+  set_code_page("jpn");
+  media.write("a.wav", silence());
+  media.write("a.cue", sheet("\x96\xE9\x82\xCC\x8D\x60"));
+  output({"index", media.path()});
+  EXPECT_EQ(value("SELECT title FROM track WHERE is_virtual = 'TRUE' AND track = 1"), "夜の港");
+}
+
 TEST_F(IndexingACueSheet, OfAnUnknownCharacterSetSaysSoAndKeepsThePlaylist) {
   media.write("a.wav", silence());
   const auto file = media.write("a.cue", sheet("Fran\xE7"

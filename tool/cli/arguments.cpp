@@ -153,8 +153,10 @@ std::string general_help(std::span<const Verb> verbs) {
 }
 
 std::string verb_help(const Verb& verb) {
-  return "Usage: " + usage_of(verb) + "\n\n" + verb.help + "\n\nOptions:\n" +
-         option_lines(verb.options) + option_lines(kCommonOptions);
+  auto out = "Usage: " + usage_of(verb) + "\n\n" + verb.help + "\n\nOptions:\n" +
+             option_lines(verb.options) + option_lines(kCommonOptions);
+  if (verb.statuses) out += std::string("\nExit status: ") + verb.statuses + ".\n";
+  return out;
 }
 
 }  // namespace mediidx::tool

@@ -35,6 +35,7 @@ struct Verb {
   std::span<const Option> options;
   std::span<const char* const> choices;  ///< What the first operand may be; empty: anything.
   int (*run)(const Arguments&);
+  const char* statuses = nullptr;  ///< Exit statuses that mean something of their own here.
 };
 
 /// A command line, understood.

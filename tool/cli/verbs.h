@@ -54,6 +54,16 @@ int run_folder_remove(const Arguments& arguments);
 int run_share_list(const Arguments& arguments);
 int run_share_add(const Arguments& arguments);
 int run_share_remove(const Arguments& arguments);
+int run_why(const Arguments& arguments);
+int run_inspect(const Arguments& arguments);
+int run_explain(const Arguments& arguments);
+int run_doctor(const Arguments& arguments);
+int run_verify(const Arguments& arguments);
+int run_repair(const Arguments& arguments);
+int run_rating_set(const Arguments& arguments);
+int run_rating_show(const Arguments& arguments);
+int run_rating_import(const Arguments& arguments);
+int run_rating_export(const Arguments& arguments);
 
 /// The things that "list" knows.
 std::span<const char* const> list_choices();

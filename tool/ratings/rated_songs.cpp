@@ -50,7 +50,8 @@ std::vector<std::string> cue_sheets_of(Database& database, const Song& song) {
 
 std::string name_of_user(std::uint32_t id) {
   OwnedUser user;
-  return TAVOUserGetByUID(id, out(user)) == 0 ? user->name : "";
+  TAVOUserGetByUID(id, out(user));
+  return user ? user->name : "";
 }
 
 RatingUser find_user(const std::string& named) {

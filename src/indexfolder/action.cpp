@@ -5,11 +5,14 @@
 #include <unistd.h>
 
 #include <string>
+#include <string_view>
+#include <unordered_map>
 
 #include "indexfolder/entry.h"
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
 #include "support/log.h"
+#include "support/no_throw.h"
 #include "support/root.h"
 #include "support/share.h"
 
@@ -21,12 +24,27 @@ bool is_folder(const std::string& path) {
   return stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode);
 }
 
-/// The first usable entry of `list` with this path; null when there is none.
-const Json::Value* find_by_path(const Json::Value& list, const Json::Value& path) {
-  for (const auto& entry : list) {
-    if (is_usable_entry(entry) && entry["path"] == path) return &entry;
+/// The first usable entry of each path of a list, which has to outlive this.
+class EntriesByPath {
+ public:
+  explicit EntriesByPath(const Json::Value& list) {
+    for (const auto& entry : list) {
+      if (is_usable_entry(entry)) entries_.try_emplace(*find_entry_path(entry), &entry);
+    }
   }
-  return nullptr;
+  /// The one with the path of `entry`, which is usable; null when there is none.
+  const Json::Value* find(const Json::Value& entry) const {
+    const auto found = entries_.find(*find_entry_path(entry));
+    return found == entries_.end() ? nullptr : found->second;
+  }
+
+ private:
+  std::unordered_map<std::string_view, const Json::Value*> entries_;
+};
+
+/// Null when the entry is no object, or has no such member.
+Json::Value member_of(const Json::Value& entry, const char* member) {
+  return entry.isObject() ? entry[member] : Json::Value();
 }
 
 void set_indexed_bit(TAVOSHARE& share, bool on) {
@@ -42,29 +60,34 @@ void set_indexed_bit(TAVOSHARE& share, bool on) {
 
 using mediidx::absolute_folder;
 using mediidx::below_root;
-using mediidx::find_by_path;
+using mediidx::EntriesByPath;
 using mediidx::is_usable_entry;
 using mediidx::kIndexFolderActionLog;
+using mediidx::no_throw;
 
 IndexFolderAction::IndexFolderAction() = default;
 IndexFolderAction::~IndexFolderAction() = default;
 
 int IndexFolderAction::onApply(const Json::Value& newConf, const Json::Value& comparison) {
-  Prepare(newConf, comparison);
-  if (newConf_.empty()) {
-    unlink(below_root(mediidx::kIndexFolderConfPath).c_str());
-  } else if (!Save()) {
-    return 1;
-  }
-  Reindex();
-  return 0;
+  return no_throw(kIndexFolderActionLog, 1, [&] {
+    Prepare(newConf, comparison);
+    if (newConf_.empty()) {
+      unlink(below_root(mediidx::kIndexFolderConfPath).c_str());
+    } else if (!Save()) {
+      return 1;
+    }
+    Reindex();
+    return 0;
+  });
 }
 
 int IndexFolderAction::onApply(const Json::Value& newConf) {
-  Prepare(newConf, newConf);
-  if (!Save()) return 0;
-  Reindex();
-  return 1;
+  return no_throw(kIndexFolderActionLog, 0, [&] {
+    Prepare(newConf, newConf);
+    if (!Save()) return 0;
+    Reindex();
+    return 1;
+  });
 }
 
 void IndexFolderAction::Prepare(const Json::Value& newConf, const Json::Value& comparison) {
@@ -94,7 +117,7 @@ void IndexFolderAction::Reindex() {
 
 bool IndexFolderAction::compareFolder(const Json::Value& first, const Json::Value& second) {
   for (const char* member : {"photo", "music", "video", "path"}) {
-    if (first[member] != second[member]) return false;
+    if (mediidx::member_of(first, member) != mediidx::member_of(second, member)) return false;
   }
   return true;
 }
@@ -113,9 +136,10 @@ void IndexFolderAction::checkFoldersExist(Json::Value& conf) {
 void IndexFolderAction::setUpdatedIndexFolders() {
   added_ = Json::Value(Json::arrayValue);
   changed_ = Json::Value(Json::arrayValue);
+  const EntriesByPath current_entries(currentConf_);
   for (const auto& entry : comparison_) {
     if (!is_usable_entry(entry)) continue;
-    const auto* current = find_by_path(currentConf_, entry["path"]);
+    const auto* current = current_entries.find(entry);
     if (!current) {
       added_.append(entry);
     } else if (!compareFolder(entry, *current)) {
@@ -126,8 +150,9 @@ void IndexFolderAction::setUpdatedIndexFolders() {
 
 void IndexFolderAction::setDeletedIndexFolders() {
   deleted_ = Json::Value(Json::arrayValue);
+  const EntriesByPath new_entries(newConf_);
   for (const auto& entry : currentConf_) {
-    if (is_usable_entry(entry) && !find_by_path(newConf_, entry["path"])) deleted_.append(entry);
+    if (is_usable_entry(entry) && !new_entries.find(entry)) deleted_.append(entry);
   }
 }
 

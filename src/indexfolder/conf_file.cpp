@@ -31,11 +31,10 @@ Json::Value read_conf() {
   auto conf = empty_list();
   std::ifstream file(below_root(kIndexFolderConfPath));
   if (!file) return conf;
+  // What stood before an error is used.
   try {
-    // What stood before an error is used.
     Json::Reader().parse(file, conf);
-  } catch (const Json::Exception&) {  // nested too deeply
-    return empty_list();
+  } catch (const Json::Exception&) {  // nested too deeply, an error like others
   }
   return conf.isArray() ? conf : empty_list();
 }

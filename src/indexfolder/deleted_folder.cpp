@@ -5,6 +5,7 @@
 
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 
 #include "indexfolder/entry.h"
@@ -21,7 +22,8 @@ namespace {
 /// What the file says of its shares and paths; the in-memory copy knows absolute folders only.
 struct FileForm {
   std::map<std::string, std::string> path_by_folder;   ///< Absolute folder to share-relative path.
-  std::map<std::string, std::string> folder_by_share;  ///< Share name to its absolute folder.
+  std::map<std::string, std::string> folder_by_share;  ///< Share to its absolute folder.
+  std::map<std::string, std::string> share_by_name;    ///< As paths name it, to the share.
 };
 
 FileForm read_file_form() {
@@ -33,7 +35,8 @@ FileForm read_file_form() {
     const auto share = find_share(name.c_str());
     if (!share) continue;
     form.path_by_folder[appendPath(share->path, getFolderPath(path))] = path;
-    form.folder_by_share[name] = share->path;
+    form.folder_by_share[share->name] = share->path;
+    form.share_by_name[name] = share->name;
   }
   return form;
 }
@@ -58,6 +61,7 @@ struct Remaining {
 
 Remaining collect_remaining(const FileForm& form, const std::string& folder) {
   Remaining remaining;
+  std::set<Json::Value> collected;
   for (const auto& entry : gIndexFolderConf) {
     if (IsEqualOrSubPath(entry["path"].asString(), folder)) {
       remaining.any_removed = true;
@@ -68,16 +72,15 @@ Remaining collect_remaining(const FileForm& form, const std::string& folder) {
     auto stored = entry;
     stored["path"] = path->second;
     // The in-memory copy repeats entries of equal folders.
-    bool is_repeated = false;
-    for (const auto& other : remaining.entries) is_repeated = is_repeated || other == stored;
-    if (!is_repeated) remaining.entries.append(stored);
+    if (collected.insert(stored).second) remaining.entries.append(stored);
   }
   return remaining;
 }
 
-bool holds_share(const Json::Value& entries, const std::string& share) {
+bool holds_share(const FileForm& form, const Json::Value& entries, const std::string& share) {
   for (const auto& entry : entries) {
-    if (getShareName(entry["path"].asString()) == share) return true;
+    const auto known = form.share_by_name.find(getShareName(entry["path"].asString()));
+    if (known != form.share_by_name.end() && known->second == share) return true;
   }
   return false;
 }
@@ -93,7 +96,7 @@ int remove_folder(std::string folder) {
     return -1;
   }
   const auto share = find_share_of(form, folder);
-  if (share && !holds_share(remaining.entries, *share) &&
+  if (share && !holds_share(form, remaining.entries, *share) &&
       ShareIndexStatusClear(share->c_str()) < 0) {
     kIndexFolderActionLog.colon(602, "ShareIndexStatusClear failed: %s", share->c_str());
   }

@@ -27,6 +27,10 @@ constexpr int kNoPathBuffer = 102;
 constexpr int kTypeIndexOutOfRange = 103;
 constexpr int kDumpedPath = 104;
 constexpr int kDumpedFlags = 105;
+constexpr int kTooManyRepeats = 106;
+
+/// Repeated entries that are held at most: a small file could ask for more than memory holds.
+constexpr std::size_t kMostRepeats = 250'000;
 
 /// The usable entries whose share is known, in the order of the file, with absolute paths.
 std::vector<Json::Value> read_entries() {
@@ -41,19 +45,34 @@ std::vector<Json::Value> read_entries() {
   return entries;
 }
 
+using EntriesByPath = std::map<std::string_view, std::vector<const Json::Value*>>;
+
+bool repeats_too_much(const EntriesByPath& entries_by_path) {
+  std::size_t repeats = 0;
+  for (const auto& [path, entries] : entries_by_path) {
+    repeats += entries.size() * (entries.size() - 1);
+  }
+  if (repeats <= kMostRepeats) return false;
+  kIndexFolderLog.colon(kTooManyRepeats, "Too many entries of one folder: each is held once");
+  return true;
+}
+
 /// Longest path first. Every entry is appended once for each entry of its path: two of one folder
 /// give four.
 Json::Value sorted_by_length(const std::vector<Json::Value>& entries) {
-  std::map<std::string_view, std::vector<const Json::Value*>> entries_by_path;
+  EntriesByPath entries_by_path;
   std::vector<std::string_view> paths;
   for (const auto& entry : entries) {
     paths.push_back(*find_entry_path(entry));
     entries_by_path[paths.back()].push_back(&entry);
   }
   std::ranges::stable_sort(paths, std::greater(), &std::string_view::size);
+  const bool once = repeats_too_much(entries_by_path);
   Json::Value sorted(Json::arrayValue);
   for (const auto path : paths) {
-    for (const auto* entry : entries_by_path[path]) sorted.append(*entry);
+    auto& group = entries_by_path[path];
+    for (const auto* entry : group) sorted.append(*entry);
+    if (once) group.clear();
   }
   return sorted;
 }

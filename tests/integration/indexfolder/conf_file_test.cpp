@@ -1,8 +1,11 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 #include <fcntl.h>
+#include <sys/resource.h>
 #include <sys/stat.h>
+#include <unistd.h>
 
+#include <csignal>
 #include <filesystem>
 #include <string>
 
@@ -56,13 +59,7 @@ INSTANTIATE_TEST_SUITE_P(
                     BrokenCase{"ObjectOnTop", R"({"path": "/photo"})"},
                     BrokenCase{"TextOnTop", R"("/photo")"}, BrokenCase{"NullOnTop", "null"},
                     BrokenCase{"NumberOnTop", "1"}, BrokenCase{"ZeroBytes", std::string(100, '\0')},
-                    BrokenCase{"DeeplyNested", std::string(100000, '[')},
-                    BrokenCase{"DeeplyNestedObjects",
-                               []() -> std::string {
-                                 std::string text = "[";
-                                 for (int i = 0; i < 5000; ++i) text += R"({"a":)";
-                                 return text;
-                               }()}),
+                    BrokenCase{"BadEncoding", "\xFF\xFE[\x80"}),
     [](const auto& test) { return test.param.name; });
 
 TEST_F(ConfFile, KeepsWhatStoodBeforeAnError) {
@@ -72,12 +69,73 @@ TEST_F(ConfFile, KeepsWhatStoodBeforeAnError) {
   EXPECT_EQ(conf[0]["path"], "/photo");
 }
 
-TEST_F(ConfFile, OfManyEntriesIsReadWhole) {
-  std::vector<Json::Value> many;
-  for (int i = 0; i < 10000; ++i)
-    many.push_back(entry("/p/" + std::to_string(i), true, false, false));
-  root.set_index_folders(list(many).toStyledString());
-  EXPECT_EQ(IndexFolderConfOpen().size(), 10000U);
+std::string repeated(const std::string& text, int times) {
+  std::string all;
+  for (int i = 0; i < times; ++i) all += text;
+  return all;
+}
+
+TEST_F(ConfFile, NestedTooDeeplyKeepsWhatStoodBefore) {
+  for (const auto& deep : {std::string(100000, '['), repeated(R"({"a":)", 100000),
+                           repeated("[", 100000) + repeated("]", 100000)}) {
+    root.set_index_folders(R"([{"path": "/photo", "photo": true}, )" + deep);
+    const auto conf = IndexFolderConfOpen();
+    ASSERT_GE(conf.size(), 1U);
+    EXPECT_EQ(conf[0]["path"], "/photo");
+  }
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+TEST_F(ConfFile, NestedWithinMeasureIsReadWhole) {
+  root.set_index_folders(R"([{"path": "/photo", "extra": )" + repeated("[", 500) +
+                         repeated("]", 500) + "}, {\"path\": \"/music\"}]");
+  EXPECT_THAT(paths_of(IndexFolderConfOpen()), ElementsAre("/photo", "/music"));
+}
+
+/// Gives up the superuser's rights, which no mode keeps out.
+class AsNobody {
+ public:
+  AsNobody() : own_(geteuid()) { EXPECT_EQ(seteuid(own_ == 0 ? 65534 : own_), 0); }
+  ~AsNobody() { EXPECT_EQ(seteuid(own_), 0); }
+  AsNobody(const AsNobody&) = delete;
+  AsNobody& operator=(const AsNobody&) = delete;
+
+ private:
+  uid_t own_;
+};
+
+TEST_F(ConfFile, IsEmptyWhenUnreadable) {
+  root.set_index_folders(R"([{"path": "/photo"}])");
+  fs::permissions(root.at(kConf), fs::perms::none);
+  const AsNobody rights;
+  EXPECT_EQ(IndexFolderConfOpen(), kEmptyList);
+  EXPECT_EQ(IndexFolderInit(), 0);
+  EXPECT_EQ(IndexFolderSizeGet(), 0);
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+TEST_F(ConfFile, ThatIsALoopOfLinksIsAbsent) {
+  root.make_link(kConf, root.at(kConf));
+  EXPECT_FALSE(IsIndexFolderConfExist());
+  EXPECT_EQ(IndexFolderConfOpen(), kEmptyList);
+}
+
+class HugeConfFile : public IndexFolderTest {};
+
+TEST_F(HugeConfFile, OfAHundredThousandEntriesIsReadWhole) {
+  constexpr int kEntries = 100'000;
+  const auto text = text_of_folders(kEntries);
+  EXPECT_GT(text.size(), 8'000'000U);
+  root.set_index_folders(text);
+  const auto conf = IndexFolderConfOpen();
+  ASSERT_EQ(conf.size(), static_cast<unsigned>(kEntries));
+  EXPECT_EQ(conf[kEntries - 1]["path"], "/p/" + std::to_string(kEntries - 1));
+}
+
+TEST_F(HugeConfFile, WithATextOfManyMegabytesIsReadWhole) {
+  const std::string name(8'000'000, 'x');
+  root.set_index_folders(R"([{"path": "/photo", "name": ")" + name + "\"}]");
+  EXPECT_EQ(IndexFolderConfOpen()[0]["name"], name);
 }
 
 class Saving : public IndexFolderTest {
@@ -143,6 +201,60 @@ TEST_F(Saving, FailsWhereTheTextCannotBeWritten) {
               ElementsAre("mediidx_indexfolder_action:N failed to write into "
                           "/usr/tavo/etc/index_folder.conf, reason=No space left on device"));
   EXPECT_THAT(asked_signals(), IsEmpty());
+}
+
+/// A limit of this process, set while the object lives. A file that grows past its limit then gives
+/// an error, no signal.
+class Limit {
+ public:
+  Limit(int resource, rlim_t value) : resource_(resource) {
+    std::signal(SIGXFSZ, SIG_IGN);
+    getrlimit(resource_, &before_);
+    const rlimit limit{value, before_.rlim_max};
+    EXPECT_EQ(setrlimit(resource_, &limit), 0);
+  }
+  ~Limit() {
+    setrlimit(resource_, &before_);
+    std::signal(SIGXFSZ, SIG_DFL);
+  }
+  Limit(const Limit&) = delete;
+  Limit& operator=(const Limit&) = delete;
+
+ private:
+  int resource_;
+  rlimit before_{};
+};
+
+TEST_F(Saving, ThatCannotOpenTheFileLeavesItAsItWas) {
+  root.write(kConf, "old");
+  {
+    const Limit no_more_files(RLIMIT_NOFILE, 0);
+    EXPECT_EQ(IndexFolderConfSave(kEmptyList), -1);
+  }
+  EXPECT_EQ(root.read(kConf), "old");
+  EXPECT_TRUE(was_logged("failed, reason=Too many open files"));
+}
+
+TEST_F(Saving, ThatCannotWriteLeavesTheFileEmpty) {
+  root.write(kConf, "old");
+  {
+    const Limit no_content(RLIMIT_FSIZE, 0);
+    EXPECT_EQ(IndexFolderConfSave(kEmptyList), -1);
+  }
+  EXPECT_TRUE(root.exists(kConf));
+  EXPECT_EQ(root.read(kConf), "");
+  EXPECT_TRUE(was_logged("failed to write into"));
+  EXPECT_THAT(asked_signals(), IsEmpty());
+}
+
+TEST_F(Saving, DoesNotSeeThatOnlyAPartWasWritten) {
+  {
+    const Limit two_bytes(RLIMIT_FSIZE, 2);
+    EXPECT_EQ(IndexFolderConfSave(kEmptyList), 0);
+  }
+  EXPECT_EQ(root.read(kConf), "[]");
+  EXPECT_EQ(asked_signals().size(), 4U);
+  EXPECT_THAT(logged(), IsEmpty());
 }
 
 TEST_F(ConfFile, ReloadSignalsEveryDaemonInOrder) {

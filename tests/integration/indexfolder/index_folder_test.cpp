@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: MIT
 #include "index_folder_test.h"
 
+#include <dlfcn.h>
 #include <tavocore.h>
+#include <tavosdk.h>
 
 #include <regex>
 
@@ -14,7 +16,13 @@ std::vector<std::string>& signals() {
   return asked;
 }
 
+int g_lookups = 0;
+int g_held = 0;
+
 }  // namespace
+
+int share_lookups() { return g_lookups; }
+int shares_held() { return g_held; }
 
 std::vector<std::string> log_lines() {
   static const std::regex number(R"(^(mediidx\w*:)\d+)");
@@ -35,6 +43,15 @@ Json::Value list(const std::vector<Json::Value>& entries) {
   return all;
 }
 
+std::string text_of_folders(int count) {
+  std::string text = "[";
+  for (int i = 0; i < count; ++i) {
+    text += (i == 0 ? "" : ",\n") + (R"({"name": "one folder among many others", "path": "/p/)" +
+                                     std::to_string(i) + R"(", "photo": true, "music": false})");
+  }
+  return text + "]\n";
+}
+
 std::vector<std::string> paths_of(const Json::Value& conf) {
   std::vector<std::string> paths;
   for (const auto& one : conf) paths.push_back(one["path"].asString());
@@ -46,6 +63,7 @@ IndexFolderTest::IndexFolderTest() {
   gIsBlockUpdate = gIsDirty = 0;
   clear_log();
   signals().clear();
+  g_lookups = g_held = 0;
 }
 
 IndexFolderTest::~IndexFolderTest() {
@@ -77,4 +95,21 @@ extern "C" TAVOCORE_EXPORT int TLIBCProcSignalByPidFile(const char* file, int si
   if (path.starts_with(root)) path.erase(0, root.size());
   mediidx::test::signals().push_back(path + " " + std::to_string(signal));
   return -1;
+}
+
+// These count, and hand on to the platform's own.
+extern "C" TAVOSDK_EXPORT int TAVOShareGet(const char* name, TAVOSHARE** share) {
+  static const auto own =
+      reinterpret_cast<decltype(&TAVOShareGet)>(dlsym(RTLD_NEXT, "TAVOShareGet"));
+  ++mediidx::test::g_lookups;
+  const int result = own(name, share);
+  if (result == 0) ++mediidx::test::g_held;
+  return result;
+}
+
+extern "C" TAVOSDK_EXPORT void TAVOShareFree(TAVOSHARE* share) {
+  static const auto own =
+      reinterpret_cast<decltype(&TAVOShareFree)>(dlsym(RTLD_NEXT, "TAVOShareFree"));
+  if (share) --mediidx::test::g_held;
+  own(share);
 }

@@ -26,9 +26,15 @@ std::vector<std::string> log_lines();
 /// "pid file signal" of every signal asked for, files below the root.
 const std::vector<std::string>& asked_signals();
 
+/// How many shares were asked for, and how many of those found are not freed.
+int share_lookups();
+int shares_held();
+
 /// An entry of a configuration.
 Json::Value entry(const std::string& path, bool photo, bool music, bool video);
 Json::Value list(const std::vector<Json::Value>& entries);
+/// The text of a configuration of so many folders: "/p/0", "/p/1", …
+std::string text_of_folders(int count);
 std::vector<std::string> paths_of(const Json::Value& conf);
 
 class IndexFolderTest : public testing::Test {

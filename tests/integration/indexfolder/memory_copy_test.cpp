@@ -111,15 +111,42 @@ TEST_F(MemoryCopy, OfAMalformedFileHoldsWhatStoodBeforeTheError) {
   EXPECT_THAT(loaded_paths(), ElementsAre(photo));
 }
 
-TEST_F(MemoryCopy, HoldsTenThousandFolders) {
+TEST_F(MemoryCopy, KeepsWhatStoodBeforeJsonNestedTooDeeply) {
+  const auto photo = add_share("photo");
+  load(R"([{"path": "/photo", "photo": true}, )" + std::string(100000, '['));
+  EXPECT_THAT(loaded_paths(), ElementsAre(photo));
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+class HugeMemoryCopy : public MemoryCopy {};
+
+TEST_F(HugeMemoryCopy, HoldsAHundredThousandFolders) {
+  constexpr int kFolders = 100'000;
   const auto share = add_share("p");
-  std::vector<Json::Value> many;
-  for (int i = 0; i < 10000; ++i) {
-    many.push_back(entry("/p/" + std::to_string(i), true, false, false));
-  }
+  load(text_of_folders(kFolders));
+  EXPECT_EQ(IndexFolderSizeGet(), kFolders);
+  EXPECT_EQ(path_at(0).size(), share.size() + 6);
+  EXPECT_EQ(path_at(kFolders - 1).size(), share.size() + 2);
+}
+
+TEST_F(HugeMemoryCopy, HoldsAFolderNamedFiveHundredTimesForEachOfThem) {
+  add_share("p");
+  load(std::vector(500, entry("/p", true, false, false)));
+  EXPECT_EQ(IndexFolderSizeGet(), 500 * 500);
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+TEST_F(HugeMemoryCopy, HoldsAFolderNamedBeyondMeasureOnceForEachEntry) {
+  constexpr int kEntries = 20'000;
+  const auto share = add_share("p");
+  std::vector<Json::Value> many(kEntries, entry("/p", true, false, false));
+  many.push_back(entry("/p/a", false, true, false));
   load(many);
-  EXPECT_EQ(IndexFolderSizeGet(), 10000);
-  EXPECT_EQ(path_at(9999).size(), share.size() + 2);
+  EXPECT_EQ(IndexFolderSizeGet(), kEntries + 1);
+  EXPECT_EQ(path_at(0), share + "/a");
+  EXPECT_EQ(path_at(kEntries), share);
+  EXPECT_THAT(log_lines(), ElementsAre("mediidx_indexfolder:N Too many entries of one folder: each "
+                                       "is held once"));
 }
 
 TEST_F(MemoryCopy, DoesNotFollowTheFileByItself) {
@@ -170,6 +197,25 @@ TEST_F(MemoryCopy, WaitsForTheUnlockToReload) {
   EXPECT_EQ(gIsDirty, 0);
   EXPECT_EQ(gIsBlockUpdate, 0);
   EXPECT_EQ(IndexFolderSizeGet(), 1);
+}
+
+TEST_F(MemoryCopy, IsReloadedOnceHoweverOftenItWasAskedFor) {
+  add_share("photo");
+  root.set_index_folders(list({entry("/photo", true, true, true)}).toStyledString());
+  IndexFolderConfLock();
+  IndexFolderUpdate();
+  IndexFolderUpdate();
+  const auto before = share_lookups();
+  IndexFolderConfUnLock();
+  EXPECT_EQ(share_lookups(), before + 1);
+  IndexFolderConfUnLock();
+  EXPECT_EQ(share_lookups(), before + 1);
+}
+
+TEST_F(MemoryCopy, FreesEveryShareThatItLookedUp) {
+  add_share("photo");
+  load({entry("/photo", true, true, true), entry("/gone", true, true, true)});
+  EXPECT_EQ(shares_held(), 0);
 }
 
 TEST_F(MemoryCopy, IsNotReloadedByAnUnlockThatNobodyAskedFor) {

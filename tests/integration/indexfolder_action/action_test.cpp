@@ -31,7 +31,16 @@ int g_program_status = 0;
 int g_share_update_result = 0;
 int g_status_clear_result = 0;
 
+int g_shares_held = 0;
+
 std::string shown(const char* text) { return text ? text : "null"; }
+
+/// A file below the root, as the library names it on the appliance.
+std::string without_root(const char* file) {
+  const std::string path = file;
+  const std::string root = TAVOPlatformRootGet();
+  return path.starts_with(root) ? path.substr(root.size()) : path;
+}
 
 }  // namespace
 
@@ -40,15 +49,13 @@ extern "C" {
 
 TAVOCORE_EXPORT int TLIBCExec(const char* program, const char* arg1, const char* arg2,
                               const char* arg3, const char* arg4) {
-  const std::string path = program;
-  g_calls.push_back(path.substr(path.rfind('/') + 1) + " " + shown(arg1) + " " + shown(arg2) + " " +
+  g_calls.push_back(without_root(program) + " " + shown(arg1) + " " + shown(arg2) + " " +
                     shown(arg3) + " " + shown(arg4));
   return g_program_status;
 }
 
 TAVOCORE_EXPORT int TLIBCProcSignalByPidFile(const char* file, int signal) {
-  const std::string path = file;
-  g_calls.push_back("signal " + path.substr(path.rfind('/') + 1) + " " + std::to_string(signal));
+  g_calls.push_back("signal " + without_root(file) + " " + std::to_string(signal));
   return -1;
 }
 
@@ -60,6 +67,22 @@ TAVOCORE_EXPORT int TLIBShareUpdate(const TAVOSHARE* share) {
 TAVOSDK_EXPORT int ShareIndexStatusClear(const char* name) {
   g_calls.push_back("clear " + std::string(name));
   return g_status_clear_result;
+}
+
+// These count, and hand on to the platform's own.
+TAVOSDK_EXPORT int TAVOShareGet(const char* name, TAVOSHARE** share) {
+  static const auto own =
+      reinterpret_cast<decltype(&TAVOShareGet)>(dlsym(RTLD_NEXT, "TAVOShareGet"));
+  const int result = own(name, share);
+  if (result == 0) ++g_shares_held;
+  return result;
+}
+
+TAVOSDK_EXPORT void TAVOShareFree(TAVOSHARE* share) {
+  static const auto own =
+      reinterpret_cast<decltype(&TAVOShareFree)>(dlsym(RTLD_NEXT, "TAVOShareFree"));
+  if (share) --g_shares_held;
+  own(share);
 }
 }
 
@@ -76,8 +99,9 @@ Json::Value list(const std::vector<Json::Value>& entries) {
   return all;
 }
 
-const std::vector<std::string> kReload{"signal tavoindexd.pid 1", "signal tavomkthumbd.pid 1",
-                                       "signal tavomkflvd.pid 1", "signal dms.pid 18"};
+const std::vector<std::string> kReload{
+    "signal /var/run/tavoindexd.pid 1", "signal /var/run/tavomkthumbd.pid 1",
+    "signal /var/run/tavomkflvd.pid 1", "signal /var/run/dms.pid 18"};
 
 std::vector<std::string> after_reload(const std::vector<std::string>& calls) {
   auto all = kReload;
@@ -93,8 +117,9 @@ class FolderAction : public testing::Test {
     root.make_folder("volume1/photo/2010");
     mediidx::test::clear_log();
     g_calls.clear();
-    g_program_status = g_share_update_result = g_status_clear_result = 0;
+    g_program_status = g_share_update_result = g_status_clear_result = g_shares_held = 0;
   }
+  ~FolderAction() override { EXPECT_EQ(g_shares_held, 0); }
 
   void store(const std::vector<Json::Value>& entries) {
     root.set_index_folders(list(entries).toStyledString());
@@ -105,17 +130,18 @@ class FolderAction : public testing::Test {
     return all;
   }
   static std::string drop(const std::string& folder) {
-    return "tavoindex -D " + folder + " -P MediaIndex";
+    return "/usr/tavo/bin/tavoindex -D " + folder + " -P MediaIndex";
   }
   static std::string add(const std::string& folder) {
-    return "tavoindex -A " + folder + " -P MediaIndex";
+    return "/usr/tavo/bin/tavoindex -A " + folder + " -P MediaIndex";
   }
 
   mediidx::test::ScratchRoot root;
   std::string photo = root.at("volume1/photo");
   std::string music = root.at("volume1/music");
   IndexFolderAction action;
-  static constexpr const char* kCheck = "tavoindex_mgr --check-indexbit null null null";
+  static constexpr const char* kCheck =
+      "/usr/tavo/bin/tavoindex_mgr --check-indexbit null null null";
 };
 
 TEST_F(FolderAction, ThatAddsAFolderChecksTheSharesAndThenIndexesIt) {
@@ -145,6 +171,37 @@ TEST_F(FolderAction, ThatDeletesAFolderIndexesItBeforeTheCheck) {
   EXPECT_EQ(g_calls, after_reload({drop(music), add(music), kCheck}));
 }
 
+TEST_F(FolderAction, DropsDeletedFoldersChecksTheSharesThenAddsAndThenIndexesChangedOnes) {
+  const auto a = root.make_folder("volume1/music/a");
+  const auto b = root.make_folder("volume1/music/b");
+  store({entry("/music", false, true, false), entry("/music/a", false, true, false),
+         entry("/photo", true, false, false), entry("/music/b", false, true, false)});
+  const auto conf =
+      list({entry("/music/b", true, true, false), entry("/photo/2010", true, false, false),
+            entry("/photo", true, true, false)});
+  const auto expected =
+      after_reload({drop(music), add(music), drop(a), add(a), kCheck, drop(photo + "/2010"),
+                    add(photo + "/2010"), drop(b), add(b), drop(photo), add(photo)});
+  EXPECT_EQ(action.onApply(conf, conf), 0);
+  EXPECT_EQ(g_calls, expected);
+  EXPECT_EQ(IndexFolderConfOpen(), conf);
+}
+
+TEST_F(FolderAction, GoesOnWhenTheIndexerFails) {
+  g_program_status = -1;
+  store({entry("/photo", true, false, false)});
+  EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
+  EXPECT_EQ(g_calls, after_reload({drop(photo), add(photo), kCheck, drop(music), add(music)}));
+  EXPECT_THAT(logged_messages(), ElementsAre("ModifyShareStatus failed"));
+}
+
+TEST_F(FolderAction, MayBeUsedAgain) {
+  EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
+  g_calls.clear();
+  EXPECT_EQ(action.onApply(list({entry("/photo", true, false, false)})), 1);
+  EXPECT_EQ(g_calls, after_reload({drop(music), add(music), kCheck, drop(photo), add(photo)}));
+}
+
 TEST_F(FolderAction, WithNothingChangedSavesAndRunsNoProgram) {
   store({entry("/music", false, true, false)});
   EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
@@ -162,6 +219,21 @@ TEST_F(FolderAction, OfAnEmptyConfigurationDeletesTheFileAndIndexesEveryFolderOf
                                    add(photo + "/2010"), kCheck));
 }
 
+TEST_F(FolderAction, OfAnEmptyConfigurationWithoutAFileDoesNothing) {
+  EXPECT_EQ(action.onApply(Json::Value(Json::arrayValue), Json::Value(Json::arrayValue)), 0);
+  EXPECT_THAT(g_calls, IsEmpty());
+  EXPECT_THAT(logged(), IsEmpty());
+}
+
+TEST_F(FolderAction, OfFoldersThatAreAllAwayDeletesTheFile) {
+  store({entry("/music", false, true, false)});
+  std::filesystem::remove(music);
+  const auto conf = list({entry("/music", false, true, false)});
+  EXPECT_EQ(action.onApply(conf, conf), 0);
+  EXPECT_FALSE(IsIndexFolderConfExist());
+  EXPECT_THAT(g_calls, ElementsAre(drop(music), add(music), kCheck));
+}
+
 TEST_F(FolderAction, OfAnEmptyConfigurationInOneArgumentSavesAnEmptyFile) {
   store({entry("/music", false, true, false)});
   EXPECT_EQ(action.onApply(Json::Value(Json::arrayValue)), 1);
@@ -176,6 +248,84 @@ TEST_F(FolderAction, FindsAddedFoldersInTheComparisonListOnly) {
             0);
   EXPECT_EQ(g_calls, after_reload({kCheck, drop(photo), add(photo)}));
   EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music", "/photo"));
+}
+
+TEST_F(FolderAction, AddsNoFolderOfTheComparisonListThatIsAway) {
+  const auto conf = list({entry("/music", false, true, false)});
+  EXPECT_EQ(action.onApply(conf, list({entry("/photo/away", true, false, false)})), 0);
+  EXPECT_EQ(g_calls, kReload);
+}
+
+TEST_F(FolderAction, ComparesWithTheFirstOfSeveralEntriesOfAFolder) {
+  store({entry("/music", false, true, false), entry("/music", true, true, true)});
+  EXPECT_EQ(action.onApply(
+                list({entry("/music", false, true, false), entry("/photo", true, false, false)})),
+            1);
+  EXPECT_EQ(g_calls, after_reload({kCheck, drop(photo), add(photo)}));
+}
+
+TEST_F(FolderAction, LeavesANameAloneThatDiffersInCase) {
+  store({entry("/Music", false, true, false)});
+  EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
+  EXPECT_EQ(g_calls, after_reload({drop(music), add(music), kCheck, drop(music), add(music)}));
+}
+
+struct HugeFolderAction : FolderAction {};
+
+TEST_F(HugeFolderAction, GivesUpThirtyThousandFoldersThatAreAwayAndKeepsTheOneThatIsThere) {
+  constexpr int kFolders = 30'000;
+  std::vector<Json::Value> many{entry("/music", false, true, false)};
+  for (int i = 0; i < kFolders; ++i) {
+    many.push_back(entry("/music/" + std::to_string(i), false, true, false));
+  }
+  store(many);
+  EXPECT_EQ(action.onApply(list(many)), 1);
+  EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music"));
+  EXPECT_EQ(g_calls.size(), kReload.size() + 2 * kFolders + 1);
+  EXPECT_EQ(g_calls.back(), kCheck);
+}
+
+TEST_F(FolderAction, OverAMalformedFileTakesWhatStoodBeforeTheError) {
+  for (const auto& rest : {std::string(R"({"path": )"), std::string(100'000, '[')}) {
+    root.set_index_folders(R"([{"path": "/photo", "photo": true}, )" + rest);
+    g_calls.clear();
+    EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
+    EXPECT_EQ(g_calls, after_reload({drop(photo), add(photo), kCheck, drop(music), add(music)}));
+    EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music"));
+  }
+}
+
+struct OddFile {
+  const char* name;
+  std::string text;
+};
+
+class FolderActionOverAnOddFile : public FolderAction,
+                                  public testing::WithParamInterface<OddFile> {};
+
+TEST_P(FolderActionOverAnOddFile, FindsEveryFolderAdded) {
+  root.set_index_folders(GetParam().text);
+  EXPECT_EQ(action.onApply(list({entry("/music", false, true, false)})), 1);
+  EXPECT_EQ(g_calls, after_reload({kCheck, drop(music), add(music)}));
+  EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music"));
+}
+
+INSTANTIATE_TEST_SUITE_P(Cases, FolderActionOverAnOddFile,
+                         testing::Values(OddFile{"Empty", ""}, OddFile{"NoJson", "photo = yes"},
+                                         OddFile{"ObjectOnTop", R"({"a": {"path": "/photo"}})"},
+                                         OddFile{"NullOnTop", "null"},
+                                         OddFile{"DeeplyNested", std::string(100'000, '[')},
+                                         OddFile{"Zeros", std::string(1000, '\0')}),
+                         [](const auto& test) { return test.param.name; });
+
+TEST_F(FolderAction, OfWhatIsNoListIsThatOfAnEmptyOne) {
+  for (const auto& odd : {Json::Value(), Json::Value(5), Json::Value("text")}) {
+    store({entry("/music", false, true, false)});
+    g_calls.clear();
+    EXPECT_EQ(action.onApply(odd, odd), 0);
+    EXPECT_THAT(g_calls, ElementsAre(drop(music), add(music), kCheck));
+    EXPECT_FALSE(IsIndexFolderConfExist());
+  }
 }
 
 TEST_F(FolderAction, ThatCannotSaveFailsInBothFormsAndIndexesNothing) {
@@ -237,6 +387,20 @@ TEST_F(FolderAction, ComparesPathAndFlagsOnly) {
   EXPECT_FALSE(action.compareFolder(entry("/music", false, false, false), other));
   EXPECT_FALSE(action.compareFolder(entry("/music", false, true, true), other));
   EXPECT_FALSE(action.compareFolder(entry("/Music", false, true, false), other));
+}
+
+TEST_F(FolderAction, ComparesWhatIsNoEntryAsOneWithoutMembers) {
+  EXPECT_TRUE(action.compareFolder(Json::Value(5), Json::Value("text")));
+  EXPECT_TRUE(action.compareFolder(Json::Value(), Json::Value(Json::objectValue)));
+  EXPECT_FALSE(action.compareFolder(Json::Value(Json::arrayValue), entry("/a", true, true, true)));
+}
+
+TEST_F(FolderAction, ReindexesAndChecksNothingOfWhatIsNoList) {
+  Json::Value odd = entry("/music", false, true, false);
+  action.ReindexFolders(odd);
+  action.checkFoldersExist(odd);
+  EXPECT_EQ(odd, Json::Value(Json::arrayValue));
+  EXPECT_THAT(g_calls, IsEmpty());
 }
 
 struct Shares : FolderAction {
@@ -366,6 +530,93 @@ TEST_F(VanishedFolder, LetsAReloadThatWasAskedForHappen) {
   EXPECT_EQ(IndexFolderConfDelFolder((photo + "/2010").c_str()), 0);
   EXPECT_EQ(gIsDirty, 0);
   EXPECT_EQ(IndexFolderSizeGet(), 1);
+}
+
+TEST_F(VanishedFolder, StaysInMemoryUntilAReload) {
+  load({entry("/photo/2010", true, false, false), entry("/music", false, true, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_EQ(IndexFolderSizeGet(), 2);
+  EXPECT_EQ(gIsBlockUpdate, 0);
+  IndexFolderUpdate();
+  EXPECT_EQ(IndexFolderSizeGet(), 1);
+}
+
+TEST_F(VanishedFolder, ThatWasTheLastLeavesAnEmptyListInTheFile) {
+  load({entry("/photo/2010", true, false, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_TRUE(IsIndexFolderConfExist());
+  EXPECT_EQ(IndexFolderConfOpen(), Json::Value(Json::arrayValue));
+}
+
+TEST_F(VanishedFolder, LeavesTheOthersLongestFirst) {
+  load({entry("/music", false, true, false), entry("/photo/2010", true, false, false),
+        entry("/photo", true, false, false), entry("/music/long/way", false, true, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music/long/way", "/music", "/photo"));
+}
+
+TEST_F(VanishedFolder, MayBeTheShareItself) {
+  load({entry("/photo", true, false, false), entry("/photo/2010", true, false, false),
+        entry("/music", false, true, false)});
+  EXPECT_EQ(vanish(photo), 0);
+  EXPECT_EQ(g_calls, after_reload({"clear photo"}));
+  EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/music"));
+}
+
+TEST_F(VanishedFolder, AboveEveryShareClearsNone) {
+  load({entry("/photo", true, false, false), entry("/music", false, true, false)});
+  EXPECT_EQ(vanish(root.at("volume1")), 0);
+  EXPECT_EQ(g_calls, kReload);
+  EXPECT_EQ(IndexFolderConfOpen(), Json::Value(Json::arrayValue));
+}
+
+TEST_F(VanishedFolder, LiesInTheDeepestShareThatHoldsIt) {
+  root.add_share("inner", photo + "/inner");
+  load({entry("/inner/a", true, false, false), entry("/photo/b", true, false, false)});
+  EXPECT_EQ(vanish(photo + "/inner/a"), 0);
+  EXPECT_EQ(g_calls, after_reload({"clear inner"}));
+}
+
+TEST_F(VanishedFolder, LeavesAShareIndexedThatAnotherEntryNamesInOtherCase) {
+  load({entry("/Photo/2010", true, false, false), entry("/photo/a", true, false, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_EQ(g_calls, kReload);
+  EXPECT_THAT(paths(IndexFolderConfOpen()), ElementsAre("/photo/a"));
+}
+
+TEST_F(VanishedFolder, BesideANameThatItBeginsLeavesThatAlone) {
+  load({entry("/photo/2010x", true, false, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_THAT(g_calls, IsEmpty());
+}
+
+TEST_F(VanishedFolder, ThatIsAFileNowStillExists) {
+  load({entry("/photo/2010", true, false, false)});
+  std::filesystem::remove_all(photo + "/2010");
+  root.write("volume1/photo/2010", "a file");
+  EXPECT_EQ(IndexFolderConfDelFolder((photo + "/2010").c_str()), 0);
+  EXPECT_THAT(g_calls, IsEmpty());
+}
+
+TEST_F(VanishedFolder, KeepsEntriesOfOneFolderOnceEach) {
+  load({entry("/photo/2010", true, false, false), entry("/music", false, true, false),
+        entry("/music", true, true, false)});
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_EQ(IndexFolderConfOpen(),
+            list({entry("/music", false, true, false), entry("/music", true, true, false)}));
+}
+
+struct HugeVanishedFolder : VanishedFolder {};
+
+TEST_F(HugeVanishedFolder, AmongTwentyThousandIsTakenOutAlone) {
+  constexpr unsigned kFolders = 20'000;
+  std::vector<Json::Value> many{entry("/photo/2010", true, false, false)};
+  for (unsigned i = 0; i < kFolders; ++i) {
+    many.push_back(entry("/music/" + std::to_string(i), false, true, false));
+  }
+  load(many);
+  EXPECT_EQ(vanish(photo + "/2010"), 0);
+  EXPECT_EQ(IndexFolderConfOpen().size(), kFolders);
 }
 
 }  // namespace

@@ -13,6 +13,7 @@
 #include "mediidx/index_folder.h"
 #include "scan/known_folders.h"
 #include "scan/share_file.h"
+#include "store/settings_lock.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -79,8 +80,7 @@ int run_share_list(const Arguments& arguments) {
 int run_share_add(const Arguments& arguments) {
   const auto folder = real_folder(arguments.operands[1]);
   const DataFolder data(arguments.value("--data-dir"));
-  FileLock lock(data.path() / "lock");
-  lock.own();
+  const SettingsLock lock(data);
   ShareFile file(data.root());
   check_name(file.shares(), arguments.operands[0]);
   IndexFolderUpdate();
@@ -93,8 +93,7 @@ int run_share_add(const Arguments& arguments) {
 int run_share_remove(const Arguments& arguments) {
   const auto& name = arguments.operands[0];
   const DataFolder data(arguments.value("--data-dir"));
-  FileLock lock(data.path() / "lock");
-  lock.own();
+  const SettingsLock lock(data);
   ShareFile file(data.root());
   if (!file.shares().contains(name)) {
     throw std::runtime_error("there is no share " + escape_for_display(name));

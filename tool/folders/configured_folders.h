@@ -7,6 +7,7 @@
 
 #include <json/value.h>
 
+#include <filesystem>
 #include <string>
 #include <vector>
 
@@ -25,6 +26,10 @@ struct ConfiguredFolder {
 
 /// The entries in the file's order, without those that cannot be used. What is no list has none.
 std::vector<ConfiguredFolder> configured_folders();
+
+/// True when it is known of every entry which folder it means. Only then is a folder that no entry
+/// names one that somebody took out on purpose.
+bool is_configuration_whole(const std::filesystem::path& root);
 
 }  // namespace mediidx::tool
 

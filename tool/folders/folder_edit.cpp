@@ -8,6 +8,7 @@
 
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
+#include "mediidx/request.h"
 #include "scan/known_folders.h"
 #include "store/pid_file.h"
 #include "store/query.h"
@@ -19,11 +20,15 @@ namespace {
 namespace fs = std::filesystem;
 using What = FolderChange::What;
 
-const ConfiguredFolder* find_entry(const std::vector<ConfiguredFolder>& list,
-                                   const Json::Value& entry) {
-  const auto found = std::ranges::find_if(
-      list, [&entry](const auto& other) { return other.entry["path"] == entry["path"]; });
-  return found == list.end() ? nullptr : &*found;
+/// The first of each path.
+using FoldersByPath = std::map<std::string, const ConfiguredFolder*>;
+
+FoldersByPath by_path(const std::vector<ConfiguredFolder>& list) {
+  FoldersByPath out;
+  for (const auto& configured : list) {
+    out.try_emplace(configured.entry["path"].asString(), &configured);
+  }
+  return out;
 }
 
 bool holds(const std::vector<ConfiguredFolder>& list, const std::string& folder) {
@@ -39,11 +44,24 @@ void check_all_there(const std::vector<ConfiguredFolder>& folders) {
   }
 }
 
-/// Nobody else changes the settings between reading and writing them.
-ShareFile read_locked(FileLock& lock, const DataFolder& data) {
-  lock.own();
+ShareFile read_shares(const DataFolder& data) {
   check_configuration(data.root());
   return ShareFile(data.root());
+}
+
+/// The indexer keeps what a parent may still want; but what was given up leaves no row.
+void forget_given_up(const std::vector<FolderChange>& list) {
+  for (const auto& change : list) {
+    std::error_code ignored;
+    if (change.what != What::kRemoved || change.folder.empty() ||
+        fs::exists(change.folder, ignored) ||
+        IndexFolderIsFolderIndexed(change.folder.c_str()) <= 0) {
+      continue;
+    }
+    if (TAVOMediaIndexDirDelete(change.folder.c_str()) >= 0) continue;
+    throw std::runtime_error(escape_for_display(change.folder) +
+                             " could not be taken out of the index");
+  }
 }
 
 bool is_same(const Json::Value& first, const Json::Value& second) {
@@ -54,8 +72,8 @@ bool is_same(const Json::Value& first, const Json::Value& second) {
 
 FolderEdit::FolderEdit(const DataFolder& data, bool drop_missing)
     : data_(data),
-      lock_(data.path() / "lock"),
-      share_file_(read_locked(lock_, data)),
+      lock_(data),
+      share_file_(read_shares(data)),
       before_(configured_folders()),
       after_(before_) {
   if (!drop_missing) check_all_there(before_);
@@ -103,15 +121,17 @@ std::vector<FolderChange> FolderEdit::changes() const {
   std::vector<FolderChange> removed;
   std::vector<FolderChange> added;
   std::vector<FolderChange> changed;
+  const auto kept = by_path(after_);
+  const auto known = by_path(before_);
   for (const auto& configured : before_) {
-    if (find_entry(after_, configured.entry)) continue;
+    if (kept.contains(configured.entry["path"].asString())) continue;
     removed.push_back({What::kRemoved, configured.entry, configured.folder});
   }
   for (const auto& configured : after_) {
-    const auto* known = find_entry(before_, configured.entry);
-    if (!known) {
+    const auto before = known.find(configured.entry["path"].asString());
+    if (before == known.end()) {
       added.push_back({What::kAdded, configured.entry, configured.folder});
-    } else if (!is_same(configured.entry, known->entry)) {
+    } else if (!is_same(configured.entry, before->second->entry)) {
       changed.push_back({What::kChanged, configured.entry, configured.folder});
     }
   }
@@ -137,6 +157,7 @@ void FolderEdit::apply() {
     throw std::runtime_error("the index-folder configuration cannot be written");
   }
   IndexFolderUpdate();
+  forget_given_up(list);
   // The action runs nothing where only kinds were switched.
   const bool only_kinds =
       std::ranges::all_of(list, [](const auto& change) { return change.what == What::kChanged; });

@@ -12,6 +12,7 @@
 #include "folders/configured_folders.h"
 #include "scan/share_file.h"
 #include "store/data_folder.h"
+#include "store/settings_lock.h"
 
 namespace mediidx::tool {
 
@@ -51,7 +52,7 @@ class FolderEdit {
   Json::Value new_entries() const;
 
   const DataFolder& data_;
-  FileLock lock_;
+  SettingsLock lock_;
   ShareFile share_file_;
   std::vector<ConfiguredFolder> before_;
   std::vector<ConfiguredFolder> after_;

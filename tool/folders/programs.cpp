@@ -10,6 +10,7 @@
 #include "cli/output.h"
 #include "cli/progress.h"
 #include "cli/verbs.h"
+#include "folders/configured_folders.h"
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
 #include "mediidx/record.h"
@@ -20,6 +21,7 @@
 #include "store/data_folder.h"
 #include "store/database.h"
 #include "store/query.h"
+#include "store/settings_lock.h"
 #include "support/share.h"
 #include "text/utf8.h"
 
@@ -96,6 +98,11 @@ int drop_folder(const DataFolder& data, const std::string& folder) {
   const bool is_wanted =
       IndexFolderIsFolderIndexed(folder.c_str()) > 0 || !index_folders_below(folder).empty();
   if (!exists && is_wanted) return kExitDone;
+  if (!exists && !is_configuration_whole(data.root())) {
+    throw std::runtime_error(escape_for_display(folder) +
+                             " is not there, and the index-folder configuration does not tell "
+                             "whether it was given up: its index is kept");
+  }
   const Database database(data);
   const int result =
       exists ? TAVOMediaIndexPreReindex(folder.c_str()) : TAVOMediaIndexDirDelete(folder.c_str());
@@ -143,6 +150,7 @@ int run_index_manager(const std::string& program, const std::vector<std::string>
     throw UsageError("tavoindex_mgr needs --check-indexbit");
   }
   const auto data = data_folder_of(program);
+  const SettingsLock lock(data);
   IndexFolderUpdate();
   mark_shares(data.root(), false);
   mark_shares(data.root(), true);

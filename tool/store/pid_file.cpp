@@ -16,10 +16,21 @@ namespace fs = std::filesystem;
 fs::path file_of(const DataFolder& data) { return data.root() / "var/run/tavoindexd.pid"; }
 fs::path lock_of(const DataFolder& data) { return data.path() / "index.lock"; }
 
+/// Held for the moment in which somebody finds out whose the file is: who only looks is not taken
+/// for a process that runs.
+class Look {
+ public:
+  explicit Look(const DataFolder& data) : lock_(data.path() / "pid.lock") { lock_.own(); }
+
+ private:
+  FileLock lock_;
+};
+
 }  // namespace
 
-PidFile::PidFile(const DataFolder& data)
-    : file_(file_of(data)), lock_(lock_of(data)), is_ours_(lock_.try_own()) {
+PidFile::PidFile(const DataFolder& data) : file_(file_of(data)), lock_(lock_of(data)) {
+  const Look look(data);
+  is_ours_ = lock_.try_own();
   if (!is_ours_) return;
   std::ofstream out(file_, std::ios::trunc);
   out << getpid() << "\n";
@@ -33,6 +44,7 @@ PidFile::~PidFile() {
 }
 
 void PidFile::remove_stale(const DataFolder& data) {
+  const Look look(data);
   FileLock lock(lock_of(data));
   if (lock.try_own()) fs::remove(file_of(data));
 }

@@ -24,8 +24,8 @@ class PidFile {
 
  private:
   std::filesystem::path file_;
-  FileLock lock_;
-  bool is_ours_;
+  FileLock lock_;  ///< Held by the process that the file names, for as long.
+  bool is_ours_ = false;
 };
 
 }  // namespace mediidx::tool

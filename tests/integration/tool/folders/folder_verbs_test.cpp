@@ -14,6 +14,18 @@ namespace fs = std::filesystem;
 
 class FolderVerbs : public FolderTest {};
 
+Json::Value entry(const std::string& name, const std::string& path, bool photo, bool music,
+                  bool video) {
+  Json::Value out;
+  out["name"] = name;
+  out["path"] = path;
+  out["photo"] = photo;
+  out["music"] = music;
+  out["video"] = video;
+  out["default"] = false;
+  return out;
+}
+
 TEST_F(FolderVerbs, AddingSwitchingAndRemovingAFolderKeepItsRowsTrue) {
   fill("m");
   const auto folder = media.at("m");
@@ -41,6 +53,81 @@ TEST_F(FolderVerbs, AddingSwitchingAndRemovingAFolderKeepItsRowsTrue) {
     EXPECT_EQ(count(table), 0) << table;
   }
   EXPECT_FALSE(fs::exists(settings("index_folder.conf")));
+}
+
+TEST_F(FolderVerbs, AWholeLibraryGoesInAndOutAgain) {
+  media.take_sample("", "m");
+  const auto folder = media.at("m");
+  run({"folder", "add", folder});  // some of its files are damaged
+  auto expected = Json::Value(Json::arrayValue);
+  expected.append(entry("m", "/m", true, true, true));
+  EXPECT_EQ(read_json(settings("index_folder.conf")), expected);
+  const auto tables = rows(
+      "SELECT tablename FROM pg_tables WHERE schemaname = 'public' AND tablename NOT LIKE "
+      "'personal_%' AND tablename NOT IN ('video_convert', 'virtual_music', 'rating_track')");
+  for (const auto& table : tables) EXPECT_GT(count(table[0]), 0) << table[0];
+  const auto songs = stored("music");
+  const auto photos = stored("photo");
+  const auto folders = stored("directory");
+
+  run({"folder", "set", folder, "--no-music"});
+  expected[0]["music"] = false;
+  EXPECT_EQ(read_json(settings("index_folder.conf")), expected);
+  for (const char* table : {"music", "playlist", "track", "artist_track", "virtual_info_track"}) {
+    EXPECT_EQ(count(table), 0) << table;
+  }
+  EXPECT_EQ(stored("photo"), photos);
+  EXPECT_EQ(stored("directory"), folders);
+
+  const auto sub = media.at("m/music");
+  run({"folder", "add", sub, "--music", "--name", "Songs"});
+  expected.append(entry("Songs", "/m/music", false, true, false));
+  EXPECT_EQ(read_json(settings("index_folder.conf")), expected);
+  EXPECT_THAT(stored("music"), testing::Each(testing::StartsWith("m/music/")));
+  EXPECT_GT(count("virtual_info_track"), 0);
+
+  run({"folder", "set", folder, "--music"});
+  run({"folder", "remove", sub});
+  expected = Json::Value(Json::arrayValue);
+  expected.append(entry("m", "/m", true, true, true));
+  EXPECT_EQ(read_json(settings("index_folder.conf")), expected);
+  EXPECT_EQ(stored("music"), songs);
+  EXPECT_EQ(stored("photo"), photos);
+  EXPECT_EQ(stored("directory"), folders);
+
+  run({"folder", "remove", folder});
+  EXPECT_FALSE(fs::exists(settings("index_folder.conf")));
+  for (const auto& table : rows("SELECT tablename FROM pg_tables WHERE schemaname = 'public'")) {
+    EXPECT_EQ(count(table[0]), 0) << table[0];
+  }
+}
+
+TEST_F(FolderVerbs, SetIndexesThatFolderOnly) {
+  fill("m");
+  fill("n");
+  output({"folder", "add", media.at("m")});
+  output({"folder", "add", media.at("n")});
+  rows("DELETE FROM music");
+  output({"folder", "set", media.at("m"), "--no-video"});
+  EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3"));
+  EXPECT_THAT(stored("video"), ElementsAre("n/c.mp4"));
+}
+
+TEST_F(FolderVerbs, ShowABarOnATerminal) {
+  fill("m");
+  Setting setting;
+  setting.on_terminal = true;
+  const Words begin{"--data-dir", data.at("d"), "folder"};
+  for (const Words& words :
+       {Words{"add", media.at("m")}, Words{"set", media.at("m"), "--no-photo"}}) {
+    auto all = begin;
+    all.insert(all.end(), words.begin(), words.end());
+    const auto done = run_mediidx(all, setting);
+    EXPECT_EQ(done.status, 0) << done.out;
+    EXPECT_THAT(done.out, HasSubstr("Indexing ")) << words[0];
+    EXPECT_THAT(done.out, HasSubstr("[                        ]   0%  0/4  ")) << words[0];
+    EXPECT_THAT(done.out, HasSubstr(media.at("m") + ": 1 music")) << words[0];
+  }
 }
 
 TEST_F(FolderVerbs, AddTakesTheNamedKindsOnly) {
@@ -137,6 +224,32 @@ TEST_F(FolderVerbs, AFolderThatIsAwayIsRemovedOnPurpose) {
   output({"folder", "remove", media.at("disk"), "--drop-missing"});
   EXPECT_THAT(stored("music"), IsEmpty());
   EXPECT_THAT(stored("directory"), IsEmpty());
+}
+
+TEST_F(FolderVerbs, ASubfolderThatIsGivenUpLeavesNoRowBelowItsParent) {
+  fill("m");
+  fill("m/sub");
+  output({"folder", "add", media.at("m"), "--photo"});
+  output({"folder", "add", media.at("m/sub"), "--music"});
+  fs::rename(media.at("m/sub"), media.at("moved"));
+  output({"folder", "remove", media.at("m/sub"), "--drop-missing"});
+  EXPECT_THAT(stored("music"), IsEmpty());
+  EXPECT_THAT(stored("photo"), ElementsAre("m/b.jpg"));
+  EXPECT_THAT(stored("directory"), ElementsAre("m"));
+}
+
+TEST_F(FolderVerbs, ASubfolderHidesAndShowsAKindAsItIsSet) {
+  fill("m");
+  fill("m/sub");
+  output({"folder", "add", media.at("m")});
+  output({"folder", "add", media.at("m/sub")});
+  EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3", "m/sub/a.mp3"));
+  output({"folder", "set", media.at("m/sub"), "--no-music"});
+  EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3"));
+  output({"folder", "set", media.at("m"), "--no-music"});
+  output({"folder", "set", media.at("m/sub"), "--music"});
+  EXPECT_THAT(stored("music"), ElementsAre("m/sub/a.mp3"));
+  EXPECT_THAT(stored("photo"), ElementsAre("m/b.jpg", "m/sub/b.jpg"));
 }
 
 TEST_F(FolderVerbs, ListShowsPathsKindsAndWhatIsAway) {

@@ -1,7 +1,9 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
+#include <fcntl.h>
 #include <json/writer.h>
 #include <signal.h>
+#include <sys/file.h>
 #include <unistd.h>
 
 #include <chrono>
@@ -67,6 +69,52 @@ TEST_F(IndexPrograms, IndexerDropsAFolderThatIsAwayAndNoLongerConfigured) {
   fs::remove(settings("index_folder.conf"));
   EXPECT_EQ(run_program("tavoindex", words_for("-D", media.at("m"))).status, 0);
   EXPECT_THAT(stored("music"), IsEmpty());
+}
+
+TEST_F(IndexPrograms, IndexerDropsNothingThatIsAwayWhileTheConfigurationDoesNotTell) {
+  fill("m");
+  output({"folder", "add", media.at("m")});
+  fs::rename(media.at("m"), media.at("moved"));
+  const std::string unusable = R"({"path": "/m", "music": "yes"})";
+  for (const auto& text : {std::string(), std::string("["), std::string("{}"), "[" + unusable + "]",
+                           std::string(R"([{"path": "/unknown"}])"), std::string(100'000, '[')}) {
+    std::ofstream(settings("index_folder.conf")) << text;
+    const auto done = run_program("tavoindex", words_for("-D", media.at("m")));
+    EXPECT_EQ(done.status, 1);
+    EXPECT_THAT(done.err, HasSubstr("its index is kept"));
+    EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3")) << text.substr(0, 80);
+  }
+  std::ofstream(settings("index_folder.conf")) << "[]";
+  EXPECT_EQ(run_program("tavoindex", words_for("-D", media.at("m"))).status, 0);
+  EXPECT_THAT(stored("music"), IsEmpty());
+}
+
+TEST_F(IndexPrograms, IndexerDropsNothingThatIsAwayWhenTheSharesAreLost) {
+  fill("m");
+  output({"folder", "add", media.at("m")});
+  fs::rename(media.at("m"), media.at("moved"));
+  fs::remove(settings("share.conf"));
+  EXPECT_EQ(run_program("tavoindex", words_for("-D", media.at("m"))).status, 1);
+  EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3"));
+}
+
+TEST_F(IndexPrograms, TakeNothingButTheServerFromTheEnvironment) {
+  fill("m");
+  output({"folder", "add", media.at("m")});
+  rows("DELETE FROM music");
+  const auto elsewhere = media.at("elsewhere");
+  Setting setting;
+  setting.program = data.at("d/root/usr/tavo/bin/tavoindex");
+  for (const char* name : {"HOME", "XDG_DATA_HOME", "XDG_CONFIG_HOME", "XDG_RUNTIME_DIR", "TMPDIR",
+                           "PATH", "MEDIIDX_DATA_DIR", "MEDIIDX_ROOT"}) {
+    setting.environment[name] = elsewhere;
+  }
+  const auto done = run_mediidx(words_for("-A", media.at("m")), setting);
+  EXPECT_EQ(done.status, 0) << done.err;
+  EXPECT_THAT(stored("music"), ElementsAre("m/a.mp3"));
+  setting.program = data.at("d/root/usr/tavo/bin/tavoindex_mgr");
+  EXPECT_EQ(run_mediidx({"--check-indexbit"}, setting).status, 0);
+  EXPECT_FALSE(fs::exists(elsewhere));
 }
 
 TEST_F(IndexPrograms, IndexerAddsNothingThatIsNotConfigured) {
@@ -139,6 +187,64 @@ TEST_F(IndexPrograms, ManagerMarksTheSharesThatHoldAnIndexFolder) {
   EXPECT_EQ(shares["n"]["status"], 0x03);
 }
 
+/// The data folder's lock in the hands of this very process.
+class HeldLock {
+ public:
+  explicit HeldLock(const std::string& file) : descriptor_(open(file.c_str(), O_RDWR | O_CLOEXEC)) {
+    EXPECT_EQ(flock(descriptor_, LOCK_EX), 0);
+  }
+  ~HeldLock() { close(descriptor_); }
+  HeldLock(const HeldLock&) = delete;
+  HeldLock& operator=(const HeldLock&) = delete;
+  void release() const { flock(descriptor_, LOCK_UN); }
+
+ private:
+  int descriptor_;
+};
+
+/// False when the process does not open the file within half a minute.
+bool wait_until_open(pid_t pid, const std::string& file) {
+  for (int i = 0; i < 3000; ++i) {
+    std::error_code error;
+    for (const auto& entry :
+         fs::directory_iterator("/proc/" + std::to_string(pid) + "/fd", error)) {
+      if (fs::read_symlink(entry, error) == file) return true;
+    }
+    std::this_thread::sleep_for(std::chrono::milliseconds(10));
+  }
+  return false;
+}
+
+TEST_F(IndexPrograms, ManagerWaitsForWhoeverChangesTheSettings) {
+  fs::create_directory(media.at("m"));
+  output({"folder", "add", media.at("m")});
+  const HeldLock lock(data.at("d/lock"));
+  Setting setting;
+  setting.program = data.at("d/root/usr/tavo/bin/tavoindex_mgr");
+  setting.meanwhile = [&](pid_t pid) {
+    EXPECT_TRUE(wait_until_open(pid, data.at("d/lock")));
+    auto shares = read_json(settings("share.conf"));
+    shares["late"] = shares["m"];
+    shares["late"]["status"] = 0x01;
+    std::ofstream(settings("share.conf")) << shares;
+    lock.release();
+  };
+  EXPECT_EQ(run_mediidx({"--check-indexbit"}, setting).status, 0);
+  EXPECT_EQ(read_json(settings("share.conf"))["late"]["status"], 0x21);
+}
+
+TEST_F(IndexPrograms, ManagerWorksUnderTheLockOfWhoeverRunsIt) {
+  fs::create_directory(media.at("m"));
+  output({"folder", "add", media.at("m")});
+  auto shares = read_json(settings("share.conf"));
+  shares["m"]["status"] = 0;
+  std::ofstream(settings("share.conf")) << shares;
+  const HeldLock lock(data.at("d/lock"));
+  std::ofstream(data.at("d/lock")) << getpid();
+  EXPECT_EQ(run_program("tavoindex_mgr", {"--check-indexbit"}).status, 0);
+  EXPECT_EQ(read_json(settings("share.conf"))["m"]["status"], 0x20);
+}
+
 TEST_F(IndexPrograms, ReuseThePrivateServerThatRuns) {
   fill("m");
   Setting setting;
@@ -201,6 +307,63 @@ TEST_F(RunningIndexer, TakesOnAChangedConfigurationBetweenTwoFiles) {
   EXPECT_THAT(done.out, HasSubstr("switched off"));
   EXPECT_LE(count("music"), 1);  // the one file that was under way
   EXPECT_THAT(stored("photo"), ElementsAre("m/b.jpg"));
+}
+
+TEST_F(RunningIndexer, ThatWasKilledLeavesItsFileToTheNext) {
+  constexpr int kSongs = 300;
+  fill("m");
+  for (int i = 0; i < kSongs; ++i) {
+    fs::copy_file(media.at("m/a.mp3"), media.at("m/" + std::to_string(i) + ".mp3"));
+  }
+  const Words words{"--data-dir", data.at("d"), "index", media.at("m")};
+  const auto run_and_signal = [&](int signal) {
+    Setting setting;
+    setting.meanwhile = [&](pid_t pid) {
+      EXPECT_TRUE(wait_for_pid_file());
+      kill(pid, signal);
+    };
+    return run_mediidx(words, setting).status;
+  };
+  EXPECT_EQ(run_and_signal(SIGKILL), 128 + SIGKILL);
+  EXPECT_TRUE(fs::exists(pid_file()));
+  output({"folder", "list"});
+  EXPECT_TRUE(fs::exists(pid_file()));
+
+  pid_t named = 0;
+  pid_t started = 0;
+  Setting setting;
+  setting.meanwhile = [&](pid_t pid) {
+    started = pid;
+    for (int i = 0; i < 3000 && named != pid; ++i) {
+      std::ifstream(pid_file()) >> named;
+      std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+  };
+  EXPECT_EQ(run_mediidx(words, setting).status, 0);
+  EXPECT_EQ(named, started);
+  EXPECT_FALSE(fs::exists(pid_file()));
+
+  EXPECT_EQ(run_and_signal(SIGKILL), 128 + SIGKILL);
+  output({"folder", "set", media.at("m"), "--no-music"});
+  EXPECT_FALSE(fs::exists(pid_file()));
+}
+
+TEST_F(RunningIndexer, ThatIsInterruptedRemovesItsFile) {
+  constexpr int kSongs = 300;
+  fill("m");
+  for (int i = 0; i < kSongs; ++i) {
+    fs::copy_file(media.at("m/a.mp3"), media.at("m/" + std::to_string(i) + ".mp3"));
+  }
+  for (const int signal : {SIGINT, SIGTERM}) {
+    Setting setting;
+    setting.meanwhile = [&](pid_t pid) {
+      EXPECT_TRUE(wait_for_pid_file());
+      kill(pid, signal);
+    };
+    const auto done = run_mediidx({"--data-dir", data.at("d"), "index", media.at("m")}, setting);
+    EXPECT_EQ(done.status, 128 + signal) << done.err;
+    EXPECT_FALSE(fs::exists(pid_file())) << signal;
+  }
 }
 
 TEST_F(RunningIndexer, ThatWasKilledIsNotSignalledAnyMore) {

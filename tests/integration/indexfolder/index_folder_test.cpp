@@ -22,7 +22,6 @@ int g_held = 0;
 }  // namespace
 
 int share_lookups() { return g_lookups; }
-int shares_held() { return g_held; }
 
 std::vector<std::string> log_lines() {
   static const std::regex number(R"(^(mediidx\w*:)\d+)");
@@ -67,6 +66,7 @@ IndexFolderTest::IndexFolderTest() {
 }
 
 IndexFolderTest::~IndexFolderTest() {
+  EXPECT_EQ(g_held, 0) << "shares that are not freed";
   gIndexFolderConf = Json::Value(Json::arrayValue);
   gIsBlockUpdate = gIsDirty = 0;
 }

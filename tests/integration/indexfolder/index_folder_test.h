@@ -26,9 +26,8 @@ std::vector<std::string> log_lines();
 /// "pid file signal" of every signal asked for, files below the root.
 const std::vector<std::string>& asked_signals();
 
-/// How many shares were asked for, and how many of those found are not freed.
+/// How many shares were asked for; a fixture sees those found freed.
 int share_lookups();
-int shares_held();
 
 /// An entry of a configuration.
 Json::Value entry(const std::string& path, bool photo, bool music, bool video);

@@ -19,6 +19,19 @@ class MemoryCopy : public IndexFolderTest {
   }
 };
 
+/// As the library was loaded, before any test.
+const bool g_started_empty = gIndexFolderConf == Json::Value(Json::arrayValue) &&
+                             gIsBlockUpdate == 0 && gIsDirty == 0 && IndexFolderSizeGet() == 0;
+
+TEST_F(MemoryCopy, StartsAsAnEmptyArrayWithoutALock) { EXPECT_TRUE(g_started_empty); }
+
+TEST_F(MemoryCopy, ReadsAMissingFlagAsOff) {
+  add_share("photo");
+  load(R"([{"path": "/photo"}])");
+  ASSERT_EQ(IndexFolderSizeGet(), 1);
+  for (const int kind : {0, 1, 2}) EXPECT_EQ(IndexFolderIsIndexTypeAt(0, kind), 0) << kind;
+}
+
 TEST_F(MemoryCopy, IsEmptyWithoutAFile) {
   EXPECT_EQ(IndexFolderInit(), 0);
   EXPECT_EQ(IndexFolderSizeGet(), 0);
@@ -210,12 +223,6 @@ TEST_F(MemoryCopy, IsReloadedOnceHoweverOftenItWasAskedFor) {
   EXPECT_EQ(share_lookups(), before + 1);
   IndexFolderConfUnLock();
   EXPECT_EQ(share_lookups(), before + 1);
-}
-
-TEST_F(MemoryCopy, FreesEveryShareThatItLookedUp) {
-  add_share("photo");
-  load({entry("/photo", true, true, true), entry("/gone", true, true, true)});
-  EXPECT_EQ(shares_held(), 0);
 }
 
 TEST_F(MemoryCopy, IsNotReloadedByAnUnlockThatNobodyAskedFor) {

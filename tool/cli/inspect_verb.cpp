@@ -26,6 +26,10 @@ MediaFile read(const std::string& path, Kind kind) {
   }
 }
 
+Json::Value as_json(const Json::Value& value) {
+  return value.isString() ? json_text(value.asString()) : value;
+}
+
 void print_json(const MediaFile& file, const std::vector<StoredField>& fields,
                 const std::vector<RawTag>& tags) {
   Json::Value out;
@@ -35,8 +39,8 @@ void print_json(const MediaFile& file, const std::vector<StoredField>& fields,
   for (const auto& field : fields) {
     Json::Value object;
     object["field"] = field.name;
-    object["read"] = field.read;
-    object["stored"] = field.stored;
+    object["read"] = as_json(field.read);
+    object["stored"] = as_json(field.stored);
     object["note"] = field.note;
     record.append(object);
   }

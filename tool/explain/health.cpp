@@ -14,7 +14,7 @@
 #include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <set>
+#include <map>
 #include <stdexcept>
 
 #include "explain/index_answer.h"
@@ -43,10 +43,10 @@ constexpr const char* kSelectCollation =
     "SELECT datcollversion AS recorded, pg_database_collation_actual_version(oid) AS actual "
     "FROM pg_database WHERE datname = current_database()";
 constexpr const char* kSelectObjects =
-    "SELECT n.nspname || '.' || c.relname AS name "
+    "SELECT n.nspname || '.' || c.relname AS name, coalesce(i.indisvalid, true) AS valid "
     "FROM pg_class c JOIN pg_namespace n ON n.oid = c.relnamespace "
     "LEFT JOIN pg_index i ON i.indexrelid = c.oid "
-    "WHERE n.nspname IN ('public', 'mediidx') AND coalesce(i.indisvalid, true)";
+    "WHERE n.nspname IN ('public', 'mediidx')";
 constexpr const char* kCountFolders =
     "SELECT (SELECT count(*) FROM directory) + (SELECT count(*) FROM personal_directory) AS folders";
 
@@ -149,9 +149,14 @@ void check_folders(std::vector<Check>& out) {
                  count > 0 ? "" : "mediidx index FOLDER"});
 }
 
-std::set<std::string> objects_of(Database& database) {
-  std::set<std::string> out;
-  for (auto rows = database.query(kSelectObjects); rows.next();) out.insert(rows.text("name"));
+/// Tables and indexes by name, and whether they can be used.
+using Objects = std::map<std::string, bool>;
+
+Objects objects_of(Database& database) {
+  Objects out;
+  for (auto rows = database.query(kSelectObjects); rows.next();) {
+    out[rows.text("name")] = rows.text("valid") == "t";
+  }
   return out;
 }
 
@@ -159,17 +164,24 @@ std::string qualified(const std::string& name) {
   return name.find('.') == std::string::npos ? "public." + name : name;
 }
 
-void check_objects(const std::set<std::string>& objects, const char* name, const char* what,
+void check_objects(const Objects& objects, const char* name, const char* what,
                    std::string_view beginning, std::vector<Check>& out) {
+  const std::string in_shell = "mediidx db shell, then: ";
   const auto wanted = schema_objects(kSchemaText, beginning);
-  std::size_t missing = 0;
+  bool is_well = true;
   for (const auto& object : wanted) {
-    if (objects.contains(qualified(object.name))) continue;
-    ++missing;
-    out.push_back({name, Health::kProblem, object.name + " is missing or broken",
-                   "mediidx db shell, then: " + object.statement});
+    const auto found = objects.find(qualified(object.name));
+    if (found != objects.end() && found->second) continue;
+    is_well = false;
+    if (found == objects.end()) {
+      out.push_back(
+          {name, Health::kProblem, object.name + " is missing", in_shell + object.statement});
+    } else {
+      out.push_back({name, Health::kProblem, object.name + " is broken: its making was interrupted",
+                     in_shell + "REINDEX INDEX " + found->first + ";"});
+    }
   }
-  if (missing > 0) return;
+  if (!is_well) return;
   out.push_back({name, Health::kOk, "all " + std::to_string(wanted.size()) + " " + what, ""});
 }
 

@@ -3,6 +3,7 @@
 #include "ratings/rating_file.h"
 
 #include <fcntl.h>
+#include <sys/file.h>
 #include <sys/stat.h>
 #include <tavocore.h>
 #include <tavosdk.h>
@@ -40,7 +41,10 @@ class Descriptor {
  public:
   explicit Descriptor(int number) : number_(number) {}
   Descriptor(Descriptor&& other) noexcept : number_(std::exchange(other.number_, -1)) {}
-  Descriptor& operator=(Descriptor&&) = delete;
+  Descriptor& operator=(Descriptor&& other) noexcept {
+    std::swap(number_, other.number_);
+    return *this;
+  }
   ~Descriptor() {
     if (number_ >= 0) close(number_);
   }
@@ -58,11 +62,21 @@ fs::path attribute_folder(const std::string& song) {
   return TAVOEADirPath(0, song.c_str(), folder.data(), size) < 0 ? fs::path() : folder.data();
 }
 
+/// Root makes files in the folders of others: what it makes belongs to whom the folder belongs.
+void give_to_owner_of(int folder, int made) {
+  struct stat above{};
+  if (geteuid() != 0 || fstat(folder, &above) != 0) return;
+  if (fchown(made, above.st_uid, above.st_gid) != 0) return;  // a file system without owners
+}
+
 /// Opens a folder within another without following a link; makes it where that is asked for.
 Descriptor open_folder(int above, const char* name, bool make) {
   constexpr mode_t kMode = 0755;
-  if (make && mkdirat(above, name, kMode) != 0 && errno != EEXIST) return Descriptor(-1);
-  return Descriptor(openat(above, name, O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC));
+  const bool is_made = make && mkdirat(above, name, kMode) == 0;
+  if (make && !is_made && errno != EEXIST) return Descriptor(-1);
+  Descriptor folder(openat(above, name, O_RDONLY | O_DIRECTORY | O_NOFOLLOW | O_CLOEXEC));
+  if (folder && is_made) give_to_owner_of(above, folder.get());
+  return folder;
 }
 
 /// The attribute folder, opened; closed with errno set when it is missing and not to be made.
@@ -92,19 +106,18 @@ std::optional<std::string> read_text(int folder, const std::string& shown_path) 
   return text;
 }
 
-/// A fresh file beside the old one; goes unless it was put in its place.
+/// A fresh file beside the old one; goes unless it was put in its place. The folder is locked, so
+/// that one that is there already was left behind.
 class FreshFile {
  public:
-  FreshFile(int folder, const std::string& shown_path)
-      : folder_(folder),
-        name_(std::string(kFileName) + "." + std::to_string(getpid())),
-        shown_path_(shown_path),
-        file_(openat(folder, name_.c_str(), O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC,
-                     0644)) {
+  FreshFile(int folder, const std::string& shown_path) : folder_(folder), shown_path_(shown_path) {
+    unlinkat(folder, kName, 0);
+    constexpr int kFlags = O_WRONLY | O_CREAT | O_EXCL | O_NOFOLLOW | O_CLOEXEC;
+    file_ = Descriptor(openat(folder, kName, kFlags, 0644));
     if (!file_) fail_with_errno(shown_path);
   }
   ~FreshFile() {
-    if (!is_placed_) unlinkat(folder_, name_.c_str(), 0);
+    if (!is_placed_) unlinkat(folder_, kName, 0);
   }
   FreshFile(const FreshFile&) = delete;
   FreshFile& operator=(const FreshFile&) = delete;
@@ -117,24 +130,26 @@ class FreshFile {
       text.remove_prefix(static_cast<std::size_t>(count));
     }
     if (fsync(file_.get()) != 0) fail_with_errno(shown_path_);
-    is_placed_ = renameat(folder_, name_.c_str(), folder_, kFileName) == 0;
+    is_placed_ = renameat(folder_, kName, folder_, kFileName) == 0;
     if (!is_placed_) fail_with_errno(shown_path_);
   }
 
  private:
-  /// Those of the file before, where they may be kept.
+  /// Those of the file before, where there is one and they may be kept.
   void keep_owner_and_mode() const {
     struct stat old{};
-    if (fstatat(folder_, kFileName, &old, AT_SYMLINK_NOFOLLOW) != 0 || !S_ISREG(old.st_mode))
-      return;
+    if (fstatat(folder_, kFileName, &old, AT_SYMLINK_NOFOLLOW) != 0) {
+      return give_to_owner_of(folder_, file_.get());
+    }
     const bool kept = fchown(file_.get(), old.st_uid, old.st_gid) == 0 || errno == EPERM;
     if (!kept || fchmod(file_.get(), old.st_mode & 0777) != 0) fail_with_errno(shown_path_);
   }
 
+  static constexpr const char* kName = "TAVOAUDIO_SONG_RATING.new";
+
   int folder_;
-  std::string name_;
   std::string shown_path_;
-  Descriptor file_;
+  Descriptor file_{-1};
   bool is_placed_ = false;
 };
 
@@ -204,6 +219,8 @@ void write_rating(const std::string& song, std::uint32_t user, int stars) {
   const auto folder = open_attributes(path, /*make=*/stars > 0);
   if (!folder && errno == ENOENT && stars == 0) return;
   if (!folder) fail_with_errno(shown_path);
+  // Others who rate by this program wait; where nothing can be locked they do not.
+  flock(folder.get(), LOCK_EX);
   const auto old = read_text(folder.get(), shown_path);
   const auto text = with_rating(old.value_or(""), user, stars);
   if (text == old.value_or("")) return;

@@ -44,7 +44,7 @@ TEST_F(Doctor, MissesAnIndexAndSaysHowItIsMade) {
   rows("DROP INDEX track_path");
   const auto found = check(json_with(1, {"doctor"}), "indexes");
   EXPECT_EQ(found["status"], "problem");
-  EXPECT_EQ(found["found"], "track_path is missing or broken");
+  EXPECT_EQ(found["found"], "track_path is missing");
   EXPECT_EQ(found["advice"],
             "mediidx db shell, then: CREATE INDEX IF NOT EXISTS track_path ON public.track USING "
             "spgist (path);");
@@ -52,10 +52,19 @@ TEST_F(Doctor, MissesAnIndexAndSaysHowItIsMade) {
   EXPECT_EQ(run({"doctor"}).status, 0);
 }
 
+TEST_F(Doctor, FindsAnIndexThatIsBroken) {
+  rows("UPDATE pg_index SET indisvalid = false WHERE indexrelid = 'public.music_path'::regclass");
+  const auto found = check(json_with(1, {"doctor"}), "indexes");
+  EXPECT_EQ(found["found"], "music_path is broken: its making was interrupted");
+  EXPECT_EQ(found["advice"], "mediidx db shell, then: REINDEX INDEX public.music_path;");
+  rows("REINDEX INDEX public.music_path");
+  EXPECT_EQ(run({"doctor"}).status, 0);
+}
+
 TEST_F(Doctor, MissesATable) {
   rows("DROP TABLE video_convert");
   const auto checks = json_with(1, {"doctor"});
-  EXPECT_EQ(check(checks, "tables")["found"], "public.video_convert is missing or broken");
+  EXPECT_EQ(check(checks, "tables")["found"], "public.video_convert is missing");
 }
 
 TEST_F(Doctor, GoesOnWithoutADatabase) {
@@ -107,7 +116,7 @@ TEST_F(Doctor, ShowsEveryAdviceOnATerminal) {
   setting.on_terminal = true;
   const auto done = run({"doctor"}, setting);
   EXPECT_EQ(done.status, 1);
-  EXPECT_THAT(done.out, HasSubstr("problem  indexes: track_path is missing or broken\r\n"));
+  EXPECT_THAT(done.out, HasSubstr("problem  indexes: track_path is missing\r\n"));
   EXPECT_THAT(done.out, HasSubstr("USING spgist (path);\r\n"));
 }
 

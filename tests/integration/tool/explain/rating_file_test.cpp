@@ -4,6 +4,8 @@
 
 #include <gmock/gmock.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -68,6 +70,50 @@ TEST_F(ARatingFile, IsNotMadeToRemoveARating) {
   EXPECT_FALSE(std::filesystem::exists(folder.at("@eaDir")));
 }
 
+TEST_F(ARatingFile, TakesTheRatingsOfManyAtOnce) {
+  constexpr std::uint32_t kUsers = 16;
+  std::vector<pid_t> children;
+  for (std::uint32_t user = 1; user <= kUsers; ++user) {
+    const pid_t child = fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+      for (int stars = 1; stars <= 5; ++stars) write_rating(song, user, stars);
+      _exit(0);
+    }
+    children.push_back(child);
+  }
+  for (const pid_t child : children) {
+    int status = -1;
+    waitpid(child, &status, 0);
+    EXPECT_EQ(status, 0);
+  }
+  const auto ratings = read_ratings(song);
+  EXPECT_EQ(ratings.size(), kUsers);
+  EXPECT_THAT(ratings, testing::Each(Pair(testing::_, 5)));
+}
+
+TEST_F(ARatingFile, IsWrittenWhereAnotherWasLeftUnfinished) {
+  folder.write("@eaDir/a.mp3/TAVOAUDIO_SONG_RATING.new", "10");
+  write_rating(song, 1026, 4);
+  EXPECT_EQ(text(), "1026=4\n");
+  EXPECT_FALSE(std::filesystem::exists(file + ".new"));
+}
+
+TEST_F(ARatingFile, BelongsToWhomTheFolderBelongs) {
+  if (geteuid() == 0) {
+    ASSERT_EQ(chown(folder.path().c_str(), 12345, 23456), 0);
+  }
+  struct stat above{};
+  ASSERT_EQ(stat(folder.path().c_str(), &above), 0);
+  write_rating(song, 1026, 4);
+  for (const auto& made : {folder.at("@eaDir"), folder.at("@eaDir/a.mp3"), file}) {
+    struct stat status{};
+    ASSERT_EQ(stat(made.c_str(), &status), 0);
+    EXPECT_EQ(status.st_uid, above.st_uid) << made;
+    EXPECT_EQ(status.st_gid, above.st_gid) << made;
+  }
+}
+
 TEST_F(ARatingFile, IsNotWrittenThroughALink) {
   const OpenFolder elsewhere;
   std::filesystem::create_directory_symlink(elsewhere.path(), folder.at("@eaDir"));
@@ -75,7 +121,7 @@ TEST_F(ARatingFile, IsNotWrittenThroughALink) {
   EXPECT_TRUE(std::filesystem::is_empty(elsewhere.path()));
 }
 
-TEST_F(ARatingFile, ReplacesALinkInItsPlaceOnlyByRefusing) {
+TEST_F(ARatingFile, IsNotWrittenInPlaceOfALink) {
   const auto secret = folder.write("secret", "keep\n");
   std::filesystem::create_directories(folder.at("@eaDir/a.mp3"));
   std::filesystem::create_symlink(secret, file);

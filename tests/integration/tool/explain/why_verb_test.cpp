@@ -3,6 +3,7 @@
 #include <sys/stat.h>
 
 #include <filesystem>
+#include <sstream>
 
 #include "explain_test.h"
 #include "mediidx/request.h"
@@ -168,6 +169,19 @@ TEST_F(Why, IsDescribedInItsHelp) {
                               "3 it would not.\n"));
   EXPECT_EQ(run({"why"}).status, 2);
   EXPECT_EQ(run({"why", ""}).status, 1);
+}
+
+TEST(TheVerbsThatExplain, HaveTheirExitStatusesInTheirHelp) {
+  for (const char* verb : {"why", "inspect", "explain", "doctor", "verify", "repair", "rating set",
+                           "rating show", "rating import", "rating export"}) {
+    Words words{"help"};
+    std::istringstream in(verb);
+    for (std::string word; in >> word;) words.push_back(word);
+    const auto done = run_mediidx(words);
+    EXPECT_EQ(done.status, 0) << verb;
+    EXPECT_THAT(done.out, HasSubstr("\nExit status: 0 ")) << verb;
+    EXPECT_THAT(done.out, HasSubstr("--json")) << verb;
+  }
 }
 
 }  // namespace

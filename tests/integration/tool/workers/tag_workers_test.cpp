@@ -321,11 +321,11 @@ class AStoppedWorker : public testing::Test {
 
 TEST_F(AStoppedWorker, ThatCrashesCostsTheFileInItsHand) {
   submit({});
-  kill(pid, SIGSEGV);
+  kill(pid, SIGABRT);
   kill(pid, SIGCONT);
   auto answers = take_all(*workers);
   EXPECT_EQ(answers[0].outcome, Outcome::kLost);
-  EXPECT_EQ(answers[0].reason, "its reader died of SIGSEGV");
+  EXPECT_EQ(answers[0].reason, "its reader died of SIGABRT");
   EXPECT_EQ(count_outcomes(answers),
             (std::map<Outcome, int>{{Outcome::kRead, 29}, {Outcome::kLost, 1}}));
 }

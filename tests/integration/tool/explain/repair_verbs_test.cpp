@@ -18,7 +18,7 @@ class Repair : public ExplainTest {
     media.take_sample("music/Night Ferry", "f");
     std::filesystem::remove(at("f/lost.cue"));
     index();
-    whole_ = everything();
+    whole = everything();
   }
 
   std::vector<std::string> faults() const {
@@ -44,12 +44,12 @@ class Repair : public ExplainTest {
     const auto report = json({"repair"});
     EXPECT_THAT(report["left"], IsEmpty());
     EXPECT_EQ(run({"verify"}).status, 0);
-    EXPECT_EQ(everything(), whole_);
+    EXPECT_EQ(everything(), whole);
     return report["mended"];
   }
   std::string song() const { return quoted(at("a.mp3")); }
 
-  std::string whole_;
+  std::string whole;
 };
 
 TEST_F(Repair, FindsNothingInAnIndexThatIsWhole) {

@@ -83,7 +83,8 @@ constexpr const char* kFingerprint =
     "SELECT md5(concat("
     "(SELECT string_agg(concat(c.relname, c.relkind, a.attname, a.atttypid, a.attnotnull), ',' "
     "ORDER BY c.relname, a.attnum) FROM pg_class c JOIN pg_attribute a ON a.attrelid = c.oid "
-    "WHERE c.relnamespace IN ('public'::regnamespace, 'mediidx'::regnamespace)), "
+    "WHERE c.relnamespace IN ('public'::regnamespace, 'mediidx'::regnamespace, "
+    "'scan'::regnamespace)), "
     "(SELECT count(*) FROM pg_trigger), (SELECT count(*) FROM pg_rules), "
     "(SELECT count(*) FROM pg_proc), (SELECT count(*) FROM pg_constraint), "
     "(SELECT count(*) FROM pg_namespace), (SELECT count(*) FROM pg_db_role_setting), "
@@ -94,8 +95,9 @@ constexpr long kLargestReused = 24'000'000;
 
 constexpr const char* kDeleteRows =
     "DO $$ DECLARE name text; BEGIN "
-    "FOR name IN SELECT tablename FROM pg_tables WHERE schemaname = 'public' LOOP "
-    "EXECUTE format('DELETE FROM public.%I', name); END LOOP; END $$; "
+    "FOR name IN SELECT format('%I.%I', schemaname, tablename) FROM pg_tables "
+    "WHERE schemaname IN ('public', 'scan') LOOP "
+    "EXECUTE 'DELETE FROM ' || name; END LOOP; END $$; "
     "SELECT setval(oid::regclass, 1, false) FROM pg_class "
     "WHERE relkind = 'S' AND relnamespace = 'public'::regnamespace";
 

@@ -9,6 +9,8 @@
 
 #include "cli/interrupt.h"
 #include "cli/output.h"
+#include "store/database.h"
+#include "store/pid_file.h"
 
 namespace mediidx::tool {
 namespace {
@@ -69,6 +71,19 @@ constexpr Option kRatingExportOptions[] = {
     {"--json", nullptr, "print JSON"},
 };
 
+constexpr Option kFullSpeed{"--full-speed", nullptr,
+                            "do not leave the processor and the disks to others"};
+constexpr Option kIndexOptions[] = {kFullSpeed};
+constexpr Option kScanOptions[] = {
+    {"--full", nullptr, "read the tags of unchanged files too"},
+    {"--dry-run", nullptr, "only say what there is to do"},
+    {"--allow-mass-delete", nullptr, "forget files that are gone, however many they are"},
+    {"--accept-volumes", nullptr, "take the file systems that are mounted now as the right ones"},
+    kFullSpeed,
+    {"--progress", "json", "tell the progress as lines of JSON"},
+    {"--json", nullptr, "print the last line as JSON"},
+};
+
 int run_help(const Arguments& arguments) {
   std::string name;
   for (const auto& word : arguments.operands) name += (name.empty() ? "" : " ") + word;
@@ -95,9 +110,17 @@ const Verb kVerbs[] = {
      "index the media in these folders, from now on too",
      1,
      kAnyNumber,
-     {},
+     kIndexOptions,
      {},
      run_index},
+    {"scan",
+     "[PATH...]",
+     "bring the index up to date, of all chosen folders or these",
+     0,
+     kAnyNumber,
+     kScanOptions,
+     {},
+     run_scan},
     {"list", "music|albums|artists|genres|photos|videos|playlists|folders",
      "show what is in the index", 1, 1, kListOptions, list_choices(), run_list},
     {"show", "PATH", "show all that the index holds of one path", 1, 1, kJsonOption, {}, run_show},
@@ -331,6 +354,12 @@ int run_guarded(const std::function<int()>& what) {
   } catch (const UsageError& error) {
     complain(std::string(error.what()) + "\nTry \"mediidx help\".");
     return kExitUsage;
+  } catch (const AlreadyRunning& error) {
+    complain(error.what());
+    return kExitAlreadyRunning;
+  } catch (const NoDatabase& error) {
+    complain(error.what());
+    return noted_signal() ? kExitSignal + noted_signal() : kExitNoDatabase;
   } catch (const OutputClosed&) {
     return kExitSignal + SIGPIPE;
   } catch (const std::exception& error) {

@@ -20,6 +20,9 @@ enum ExitStatus {
   kExitFailed = 1,
   kExitUsage = 2,
   kExitSomeFailed = 3,  ///< Done, but for some files.
+  kExitVolumeAway = 4,  ///< Done, but for what is on a volume that is not there.
+  kExitNoDatabase = 5,
+  kExitAlreadyRunning = 6,  ///< Another scan of the same index runs.
   kExitSignal = 128,
 };
 
@@ -34,6 +37,7 @@ int run_guarded(const std::function<int()>& what);
 /* The verbs. Each returns its exit status, and throws std::exception for what ends it. */
 
 int run_index(const Arguments& arguments);
+int run_scan(const Arguments& arguments);
 int run_list(const Arguments& arguments);
 int run_show(const Arguments& arguments);
 int run_search(const Arguments& arguments);

@@ -8,18 +8,17 @@
 
 #include "cli/interrupt.h"
 #include "cli/output.h"
-#include "cli/progress.h"
+#include "cli/scan_run.h"
 #include "cli/verbs.h"
 #include "folders/configured_folders.h"
 #include "mediidx/index_folder.h"
 #include "mediidx/index_folder_action.h"
 #include "mediidx/record.h"
 #include "mediidx/request.h"
-#include "scan/file_walk.h"
-#include "scan/indexer.h"
 #include "scan/share_file.h"
 #include "store/data_folder.h"
 #include "store/database.h"
+#include "store/pid_file.h"
 #include "store/query.h"
 #include "store/settings_lock.h"
 #include "support/share.h"
@@ -62,8 +61,8 @@ std::vector<std::string> index_folders_below(const std::string& folder) {
   return out;
 }
 
-/// What is to be walked for a folder: itself, or the index folders below it when it lies in none.
-std::vector<std::string> folders_to_walk(const std::string& folder) {
+/// The library asks for a folder of a disk that may be away: only what is there is scanned.
+std::vector<std::string> folders_to_scan(const std::string& folder) {
   auto out = IndexFolderIsFolderIndexed(folder.c_str()) > 0 ? std::vector{folder}
                                                             : index_folders_below(folder);
   std::erase_if(out, [](const auto& path) { return !is_folder(path); });
@@ -71,25 +70,10 @@ std::vector<std::string> folders_to_walk(const std::string& folder) {
 }
 
 int add_folder(const DataFolder& data, const std::string& folder) {
-  const auto folders = folders_to_walk(folder);
+  const auto folders = folders_to_scan(folder);
   if (folders.empty()) return kExitDone;
   Database database(data);
-  FileWalk walk([] { return noted_signal() != 0; });
-  walk.exclude(data.path());
-  for (const auto& path : folders) walk.add(path);
-  const auto found = walk.finish();
-  Progress progress(found.folders.size() + found.files.size());
-  Indexer indexer(database, [&progress](const std::string& path) {
-    progress.step(path);
-    return noted_signal() == 0;
-  });
-  const auto report = indexer.run(found);
-  for (const auto& failure : report.failures) {
-    complain("not indexed: " + escape_for_display(failure.path) + ": " +
-             escape_for_display(failure.reason));
-  }
-  if (noted_signal()) return kExitSignal + noted_signal();
-  return report.failures.empty() ? kExitDone : kExitSomeFailed;
+  return exit_status(run_scanner(data, database, folders, {}));
 }
 
 int drop_folder(const DataFolder& data, const std::string& folder) {
@@ -119,6 +103,8 @@ int run_indexer(const std::string& program, const std::vector<std::string>& word
   const auto folder = stored_path(words[1]);
   if (folder.empty()) throw UsageError("/: the whole system is not indexed");
   const auto data = data_folder_of(program);
+  reload_on_hangup();
+  const PidFile pid_file(data, PidFile::IfTaken::kWait);
   IndexFolderUpdate();
   return words[0] == "-A" ? add_folder(data, folder) : drop_folder(data, folder);
 }

@@ -3,15 +3,19 @@
 #include "scan/file_walk.h"
 
 #include <dirent.h>
+#include <fcntl.h>
 #include <strings.h>
 #include <tavosdk.h>
 
 #include <algorithm>
 #include <cerrno>
+#include <climits>
+#include <cstdlib>
 #include <cstring>
+#include <fstream>
 #include <memory>
-#include <optional>
 
+#include "support/owned.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -25,24 +29,65 @@ constexpr const char* kPassedOver[] = {"@eaDir",       "#recycle",  "@Recycle",
 struct CloseFolder {
   void operator()(DIR* folder) const { closedir(folder); }
 };
+using OpenFolder = std::unique_ptr<DIR, CloseFolder>;
 
-/// The names in a folder, sorted; empty with errno set when they cannot be read to the end.
-std::optional<std::vector<std::string>> read_names(const std::string& folder) {
-  const std::unique_ptr<DIR, CloseFolder> open(opendir(folder.c_str()));
-  if (!open) return std::nullopt;
-  std::vector<std::string> names;
-  for (;;) {
-    errno = 0;
-    const dirent* entry = readdir(open.get());
-    if (!entry && errno != 0) return std::nullopt;
-    if (!entry) break;
-    if (!is_passed_over(entry->d_name)) names.emplace_back(entry->d_name);
-  }
-  std::ranges::sort(names);
-  return names;
+bool is_mount_point(const std::string& folder) {
+  struct statx status{};
+  return statx(AT_FDCWD, folder.c_str(), 0, 0, &status) == 0 &&
+         (status.stx_attributes & STATX_ATTR_MOUNT_ROOT) != 0;
+}
+
+/// As much of a file as rules may take; empty when there is none.
+std::string read_start(const std::string& path) {
+  struct stat status{};
+  if (stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode)) return {};
+  std::ifstream in(path, std::ios::binary);
+  std::string text(kIgnoreFileSize, '\0');
+  in.read(text.data(), static_cast<std::streamsize>(text.size()));
+  text.resize(static_cast<std::size_t>(in.gcount()));
+  return text;
+}
+
+bool is_in(const std::string& path, const std::string& folder) {
+  return path.size() > folder.size() && path.starts_with(folder) && path[folder.size()] == '/';
 }
 
 }  // namespace
+
+/// The names in a folder, sorted.
+struct FileWalk::Listing {
+  struct Name {
+    std::string text;
+    unsigned char type;  ///< As readdir tells it.
+  };
+  std::vector<Name> names;
+  bool has_rules = false;
+
+  /// False with errno set when they cannot be read to the end.
+  bool read(const std::string& folder) {
+    const OpenFolder open(opendir(folder.c_str()));
+    if (!open) return false;
+    for (;;) {
+      errno = 0;
+      const dirent* entry = readdir(open.get());
+      if (!entry) break;
+      if (is_passed_over(entry->d_name)) {
+        has_rules |= std::strcmp(entry->d_name, kIgnoreFile) == 0;
+      } else {
+        names.push_back({entry->d_name, entry->d_type});
+      }
+    }
+    if (errno != 0) return false;
+    std::ranges::sort(names, {}, &Name::text);
+    return true;
+  }
+};
+
+FileStatus::FileStatus(const struct stat& status)
+    : size(status.st_size),
+      modified(std::int64_t{status.st_mtim.tv_sec} * 1'000'000'000 + status.st_mtim.tv_nsec),
+      device(static_cast<std::int64_t>(status.st_dev)),
+      inode(static_cast<std::int64_t>(status.st_ino)) {}
 
 bool is_passed_over(const std::string& name) {
   return name.starts_with('.') || std::ranges::any_of(kPassedOver, [&name](const char* other) {
@@ -50,84 +95,176 @@ bool is_passed_over(const std::string& name) {
          });
 }
 
-bool FileWalk::is_new(const struct stat& status) {
-  return seen_.insert({status.st_dev, status.st_ino}).second;
+bool is_empty_folder(const std::string& folder) {
+  const OpenFolder open(opendir(folder.c_str()));
+  if (!open) return false;
+  for (;;) {
+    errno = 0;
+    const dirent* entry = readdir(open.get());
+    if (!entry) return errno == 0;
+    if (!is_passed_over(entry->d_name)) return false;
+  }
 }
+
+std::string real_path(const std::string& path) {
+  const OwnedText real(realpath(path.c_str(), nullptr));
+  return real ? real.get() : "";
+}
+
+FileWalk::FileWalk(std::vector<std::string> roots, Visit visit, Skip skip)
+    : roots_(std::move(roots)), visit_(std::move(visit)), skip_(std::move(skip)), rules_("/") {}
 
 void FileWalk::exclude(const std::string& folder) {
   struct stat status{};
-  if (stat(folder.c_str(), &status) == 0) is_new(status);
+  if (stat(folder.c_str(), &status) == 0) excluded_.insert({status.st_dev, status.st_ino});
 }
 
 bool FileWalk::is_storable(const std::string& path) {
   if (!is_utf8(path)) {
-    found_.failures.push_back({path, "its name is not valid UTF-8"});
+    skip_({path, "its name is not valid UTF-8", true});
     return false;
   }
   if (path.size() >= MEDIIDX_PATH_SIZE) {
-    found_.failures.push_back({path, "its path is too long"});
+    skip_({path, "its path is too long", true});
     return false;
   }
   return true;
 }
 
-void FileWalk::take_file(const std::string& path, const struct stat& status) {
-  const auto kind = kind_of(path);
-  if (!kind || status.st_size == 0 || !is_new(status) || !is_storable(path)) return;
-  found_.files.push_back({path, *kind});
+bool FileWalk::lies_in_root(const std::string& real) const {
+  return std::ranges::any_of(roots_, [&real](const auto& root) {
+    if (!is_in(real, root)) return real == root;
+    // A hidden file is walked under no name but the link's.
+    std::size_t at = root.size() + 1;
+    while (at < real.size()) {
+      const auto end = std::min(real.find('/', at), real.size());
+      if (is_passed_over(real.substr(at, end - at))) return false;
+      at = end + 1;
+    }
+    return true;
+  });
 }
 
-void FileWalk::walk(const std::string& folder, const struct stat& status) {
-  if (stop_() || !is_new(status) || !is_storable(folder)) return;
-  const auto names = read_names(folder);
-  if (!names) {
-    found_.failures.push_back({folder, std::strerror(errno)});
-    return;
-  }
-  found_.folders.push_back(folder);
-  std::vector<std::pair<std::string, struct stat>> subfolders;
-  for (const auto& name : *names) {
-    const auto path = folder + "/" + name;
-    struct stat entry{};
-    if (lstat(path.c_str(), &entry) != 0) {
-      if (errno != ENOENT) found_.failures.push_back({path, std::strerror(errno)});
-    } else if (S_ISLNK(entry.st_mode)) {
-      links_.push_back(path);
-    } else if (S_ISDIR(entry.st_mode)) {
-      subfolders.emplace_back(path, entry);
-    } else if (S_ISREG(entry.st_mode)) {
-      take_file(path, entry);
-    }
-  }
-  for (const auto& [path, entry] : subfolders) {
-    if (entry.st_dev != status.st_dev && IndexIsPathRemoteMount(path.c_str()) > 0) {
-      found_.failures.push_back({path, "on a network mount, which is never indexed"});
-    } else {
-      walk(path, entry);
-    }
-  }
+void FileWalk::read_rules(const std::string& folder) {
+  const auto text = read_start(folder + "/" + kIgnoreFile);
+  if (!text.empty()) rules_.add(folder, text);
 }
 
-void FileWalk::add(const std::string& folder) {
+void FileWalk::start_rules(const std::string& root) { rules_ = IgnoreRules(root); }
+
+bool FileWalk::is_left_out(const std::string& root, const std::string& folder) {
+  start_rules(root);
+  for (auto at = root.size(); at < folder.size();) {
+    const auto parent = folder.substr(0, at);
+    const auto end = std::min(folder.find('/', at + 1), folder.size());
+    read_rules(parent);
+    if (is_passed_over(folder.substr(at + 1, end - at - 1))) return true;
+    if (!rules_.is_empty() && rules_.ignores(folder.substr(0, end), true)) return true;
+    at = end;
+  }
+  return false;
+}
+
+bool FileWalk::walk(const std::string& root, const std::string& folder) {
   struct stat status{};
+  if (is_left_out(root, folder)) return true;
   if (stat(folder.c_str(), &status) != 0) {
-    found_.failures.push_back({folder, std::strerror(errno)});
+    skip_({folder, std::strerror(errno), false});
+    return true;
+  }
+  return enter(folder, status, /*through_link=*/false);
+}
+
+bool FileWalk::enter(const std::string& path, const struct stat& status, bool through_link) {
+  const Identity identity{status.st_dev, status.st_ino};
+  if (excluded_.contains(identity) || !is_storable(path)) return true;
+  if (!folders_.insert(identity).second) return true;
+  FoundFolder folder;
+  folder.path = path;
+  folder.status = FileStatus(status);
+  folder.is_mounted = is_mount_point(path);
+  Listing listing;
+  folder.is_readable = listing.read(path);
+  if (!folder.is_readable) {
+    skip_({path, std::strerror(errno), false});
+    listing = {};
+  }
+  if (listing.has_rules) read_rules(path);
+  in_linked_ = through_link;
+  list(folder, listing, status);
+  const auto links = std::exchange(links_, {});
+  const auto subfolders = folder.subfolders;
+  if (!visit_(folder)) return false;
+  for (const auto& name : subfolders) {
+    const auto subfolder = path + "/" + name;
+    struct stat entry{};
+    const bool is_link = links.contains(name);
+    if ((is_link ? stat : lstat)(subfolder.c_str(), &entry) != 0) continue;
+    if (S_ISDIR(entry.st_mode) && !enter(subfolder, entry, through_link || is_link)) return false;
+  }
+  // What was found through a link stays known, so that a second link does not find it again.
+  if (!through_link) folders_.erase(identity);
+  return true;
+}
+
+void FileWalk::list(FoundFolder& folder, const Listing& listing, const struct stat& own) {
+  for (const auto& [name, type] : listing.names) {
+    const auto path = folder.path + "/" + name;
+    const bool may_be_folder = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN;
+    if (!may_be_folder && (type != DT_REG || !kind_of(path))) continue;
+    struct stat status{};
+    if (lstat(path.c_str(), &status) != 0) {
+      if (errno == ENOENT) continue;
+      skip_({path, std::strerror(errno), false});
+      folder.unreadable.push_back(name);
+    } else if (S_ISLNK(status.st_mode)) {
+      follow(folder, name, own);
+    } else if (S_ISDIR(status.st_mode)) {
+      take_subfolder(folder, name, own, status, /*through_link=*/false);
+    } else if (S_ISREG(status.st_mode)) {
+      take_file(folder, name, status, /*through_link=*/false);
+    }
+  }
+}
+
+void FileWalk::take_file(FoundFolder& folder, const std::string& name, const struct stat& status,
+                         bool through_link) {
+  const auto path = folder.path + "/" + name;
+  const auto kind = kind_of(path);
+  if (!kind || status.st_size == 0 || !is_storable(path)) return;
+  if (!rules_.is_empty() && rules_.ignores(path, false)) return;
+  const bool has_more_names = through_link || in_linked_ || status.st_nlink > 1;
+  if (has_more_names && !linked_.insert({status.st_dev, status.st_ino}).second) return;
+  folder.files.push_back({name, *kind, FileStatus(status)});
+}
+
+void FileWalk::take_subfolder(FoundFolder& folder, const std::string& name, const struct stat& own,
+                              const struct stat& status, bool through_link) {
+  const auto path = folder.path + "/" + name;
+  const Identity identity{status.st_dev, status.st_ino};
+  if (excluded_.contains(identity) || folders_.contains(identity) || !is_storable(path)) return;
+  if (!rules_.is_empty() && rules_.ignores(path, true)) return;
+  if (status.st_dev != own.st_dev && IndexIsPathRemoteMount(path.c_str()) > 0) {
+    skip_({path, "on a network mount, which is never indexed", true});
     return;
   }
-  walk(folder, status);
+  folder.subfolders.push_back(name);
+  if (through_link) links_.insert(name);
 }
 
-void FileWalk::follow(const std::string& link) {
+void FileWalk::follow(FoundFolder& folder, const std::string& name, const struct stat& own) {
+  const auto path = folder.path + "/" + name;
   struct stat status{};
-  if (stat(link.c_str(), &status) != 0) return;
-  if (S_ISDIR(status.st_mode)) walk(link, status);
-  if (S_ISREG(status.st_mode)) take_file(link, status);
-}
-
-Found FileWalk::finish() {
-  // NOLINTNEXTLINE(modernize-loop-convert): a followed folder may bring more links.
-  for (std::size_t i = 0; i < links_.size(); ++i) follow(std::string(links_[i]));
-  return std::move(found_);
+  if (stat(path.c_str(), &status) != 0) {
+    if (errno == ENOENT || errno == ELOOP || errno == ENOTDIR) return;
+    skip_({path, std::strerror(errno), false});
+    folder.unreadable.push_back(name);
+    return;
+  }
+  const auto real = real_path(path);
+  if (real.empty() || lies_in_root(real)) return;
+  if (S_ISDIR(status.st_mode)) take_subfolder(folder, name, own, status, /*through_link=*/true);
+  if (S_ISREG(status.st_mode)) take_file(folder, name, status, /*through_link=*/true);
 }
 
 }  // namespace mediidx::tool

@@ -79,6 +79,15 @@ std::string Rows::text(const char* column) const {
   return value ? value : "";
 }
 
+std::int64_t Rows::number(const char* column) const {
+  const char* value = TAVODBFetchField(result_.get(), row_, column);
+  return value ? std::strtoll(value, nullptr, 10) : 0;
+}
+
+bool Rows::is_null(const char* column) const {
+  return TAVODBFetchField(result_.get(), row_, column) == nullptr;
+}
+
 std::string schema_statements(std::string_view schema) {
   std::string out;
   while (!schema.empty()) {
@@ -92,20 +101,35 @@ std::string schema_statements(std::string_view schema) {
   return out;
 }
 
-Database::Database(const DataFolder& folder) {
-  if (!has_configured_server()) {
-    server_ = std::make_unique<PrivateServer>(folder.path());
-    setenv("PGHOST", server_->socket_folder().c_str(), 1);
-  }
+Database::Database(const DataFolder& folder) : folder_(folder.path()) {
   try {
+    if (!has_configured_server()) start_server();
     connect();
     if (version() < kSchemaVersion) apply_schema();
     if (version() > kSchemaVersion) {
       throw std::runtime_error("the database was made by a newer mediidx");
     }
-  } catch (...) {
+  } catch (const std::exception& error) {
     MediaDBConnClose();
-    throw;
+    throw NoDatabase(error.what());
+  }
+}
+
+void Database::start_server() {
+  server_ = std::make_unique<PrivateServer>(folder_);
+  setenv("PGHOST", server_->socket_folder().c_str(), 1);
+}
+
+bool Database::reconnect() {
+  MediaDBConnClose();
+  try {
+    if (server_) {
+      server_.reset();
+      start_server();
+    }
+    return answers();
+  } catch (const std::runtime_error&) {
+    return false;
   }
 }
 
@@ -158,7 +182,10 @@ Rows Database::query(const std::string& sql) {
   return query_on(conn, sql);
 }
 
-void Database::run(const std::string& sql) { query(sql); }
+int Database::run(const std::string& sql) {
+  query(sql);
+  return TAVODBAffectedRows(gpDBConnect, nullptr);
+}
 
 bool Database::answers() {
   try {

@@ -8,8 +8,10 @@
 #include <tavodb.h>
 
 #include <cstdint>
+#include <filesystem>
 #include <memory>
 #include <optional>
+#include <stdexcept>
 #include <string>
 #include <string_view>
 
@@ -17,6 +19,11 @@
 #include "store/private_server.h"
 
 namespace mediidx::tool {
+
+/// There is no database to work with.
+struct NoDatabase : std::runtime_error {
+  using std::runtime_error::runtime_error;
+};
 
 /// True when the environment names a server of the user's.
 bool has_configured_server();
@@ -26,9 +33,14 @@ class Rows {
  public:
   explicit Rows(tavodb_result* result) : result_(result) {}
 
+  /// Moves to the first row, then to the next one; false behind the last.
   bool next();
   /// Empty for null.
   std::string text(const char* column) const;
+  /// 0 for null.
+  std::int64_t number(const char* column) const;
+  bool flag(const char* column) const { return text(column) == "t"; }
+  bool is_null(const char* column) const;
 
  private:
   struct Free {
@@ -43,7 +55,7 @@ class Rows {
 /// closed with the object.
 class Database {
  public:
-  /// Throws std::runtime_error.
+  /// Throws NoDatabase.
   explicit Database(const DataFolder& folder);
   ~Database();
   Database(const Database&) = delete;
@@ -51,10 +63,12 @@ class Database {
 
   /// Runs one query. Throws std::runtime_error with the server's message.
   Rows query(const std::string& sql);
-  /// Runs statements; throws likewise.
-  void run(const std::string& sql);
+  /// Runs statements; throws likewise. The rows that the last one touched.
+  int run(const std::string& sql);
   /// False when the server no longer answers.
   bool answers();
+  /// Connects anew, starting the private server again if it is down; false when that fails.
+  bool reconnect();
   /// Why the last statement failed; empty when it did not.
   std::string last_error() const;
   /// "mediaserver on the server at …", for people.
@@ -69,6 +83,9 @@ class Database {
   void make_database();
   void apply_schema();
 
+  void start_server();
+
+  std::filesystem::path folder_;
   std::unique_ptr<PrivateServer> server_;
   bool was_changed_ = false;
 };

@@ -6,6 +6,7 @@
 
 #include <fstream>
 #include <stdexcept>
+#include <string>
 #include <system_error>
 
 namespace mediidx::tool {
@@ -28,19 +29,30 @@ class Look {
 
 }  // namespace
 
-PidFile::PidFile(const DataFolder& data) : file_(file_of(data)), lock_(lock_of(data)) {
-  const Look look(data);
-  is_ours_ = lock_.try_own();
-  if (!is_ours_) return;
+PidFile::PidFile(const DataFolder& data, IfTaken if_taken)
+    : file_(file_of(data)), lock_(lock_of(data)) {
+  if (!try_own(data)) {
+    if (if_taken == IfTaken::kThrow) {
+      std::string pid = "another one";
+      std::ifstream(file_) >> pid;
+      throw AlreadyRunning("a scan is already running: process " + pid);
+    }
+    lock_.own();
+  }
   std::ofstream out(file_, std::ios::trunc);
   out << getpid() << "\n";
   out.close();
   if (!out) throw std::runtime_error(file_.string() + " cannot be written");
 }
 
+bool PidFile::try_own(const DataFolder& data) {
+  const Look look(data);
+  return lock_.try_own();
+}
+
 PidFile::~PidFile() {
   std::error_code ignored;
-  if (is_ours_) fs::remove(file_, ignored);
+  fs::remove(file_, ignored);
 }
 
 void PidFile::remove_stale(const DataFolder& data) {

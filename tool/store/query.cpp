@@ -8,6 +8,13 @@
 
 namespace mediidx::tool {
 
+std::string literal(std::string_view text) {
+  const std::string source(text);
+  std::string out(2 * source.size() + 1, '\0');
+  TAVODBEscapeString(out.data(), source.c_str(), source.size());
+  return "'" + std::string(out.c_str()) + "'";
+}
+
 std::string stored_path(const std::string& named) {
   if (named.empty()) throw std::runtime_error("an empty path names nothing");
   if (!is_utf8(named)) {

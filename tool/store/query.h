@@ -7,6 +7,7 @@
 
 #include <stdexcept>
 #include <string>
+#include <string_view>
 #include <type_traits>
 
 #include "store/database.h"
@@ -21,6 +22,9 @@ std::string filled(std::type_identity_t<Template<Values...>> statement, Values..
   if (!sql) throw std::runtime_error("a statement could not be made");
   return sql.get();
 }
+
+/// A text as it stands in a statement, quotes included.
+std::string literal(std::string_view text);
 
 /// Paths as the index stores them. Absolute, without "." and "..", without a slash at the end ("/"
 /// is empty); the file system is not asked, for what a path names may be away. Throws

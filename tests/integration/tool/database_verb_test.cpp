@@ -29,7 +29,7 @@ TEST_F(TheDatabase, IsMadeWhereItIsMissing) {
   drop();
   const auto run = init();
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_THAT(run.out, HasSubstr(" is ready, with version 1 of its tables.\n"));
+  EXPECT_THAT(run.out, HasSubstr(" is ready, with version 2 of its tables.\n"));
   EXPECT_EQ(rows("SELECT pg_encoding_to_char(encoding), datcollate, datctype FROM pg_database "
                  "WHERE datname = 'mediaserver'"),
             (std::vector<Row>{{"UTF8", "C", "C.UTF-8"}}));
@@ -40,7 +40,7 @@ TEST_F(TheDatabase, KeepsItsRowsWhenItIsThere) {
   rows("INSERT INTO music (path) VALUES ('/a')");
   const auto run = init();
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_THAT(run.out, HasSubstr(" was ready, with version 1 of its tables.\n"));
+  EXPECT_THAT(run.out, HasSubstr(" was ready, with version 2 of its tables.\n"));
   EXPECT_EQ(count("music"), 1);
 }
 
@@ -55,7 +55,7 @@ TEST_F(TheDatabase, GetsItsTablesWhenItIsEmpty) {
 TEST_F(TheDatabase, OfANewerVersionIsLeftAlone) {
   rows("INSERT INTO mediidx.schema_version (version) VALUES (999)");
   const auto run = init();
-  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.status, 5);
   EXPECT_EQ(run.err, "mediidx: the database was made by a newer mediidx\n");
 }
 
@@ -63,7 +63,7 @@ TEST_F(TheDatabase, ThatCannotBeReachedIsNamed) {
   Setting setting;
   setting.environment["PGHOST"] = data.at("nowhere");
   const auto run = run_mediidx({"list", "music", "--data-dir", data.at("d")}, setting);
-  EXPECT_EQ(run.status, 1);
+  EXPECT_EQ(run.status, 5);
   EXPECT_THAT(run.err,
               HasSubstr("mediidx: no connection to the database server as the role postgres"));
 }

@@ -76,7 +76,7 @@ TEST_F(Indexing, SaysWhatItFound) {
   media.take_sample(kSong, "a.mp3");
   media.take_sample(kSong, "b.mp3");
   const auto run = index({media.path()});
-  EXPECT_THAT(run.out, HasSubstr("Indexed " + media.path().string() + " after "));
+  EXPECT_THAT(run.out, HasSubstr("Indexed " + media.path().string() + ":\n"));
   EXPECT_THAT(run.out, HasSubstr("\n  music               2\n"));
   EXPECT_THAT(run.out, HasSubstr("\n  folders             1\n"));
   EXPECT_THAT(run.out, HasSubstr("\n  failed              0\n"));

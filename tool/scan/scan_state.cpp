@@ -1,0 +1,506 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+#include "scan/scan_state.h"
+
+#include <unistd.h>
+
+#include <chrono>
+#include <utility>
+
+#include "store/query.h"
+
+namespace mediidx::tool {
+namespace {
+
+// A statement of this many rows is a few hundred kilobytes at most.
+constexpr std::size_t kRowsOfAStatement = 500;
+
+std::string number(std::int64_t value) { return std::to_string(value); }
+template <class Enum>
+std::string code(Enum value) {
+  return std::to_string(static_cast<int>(value));
+}
+
+/// "f" is this folder or lies below it.
+std::string in_folder(const std::string& folder) {
+  return "(f.path = " + literal(folder) + " OR f.path ^@ " + literal(folder + "/") + ")";
+}
+
+/// Calls `write` with the rows of a VALUES list, so many at a time.
+template <class Items, class Row, class Write>
+void in_portions(const Items& items, const Row& row, const Write& write) {
+  std::string values;
+  std::size_t count = 0;
+  for (const auto& item : items) {
+    values += (values.empty() ? "(" : ", (") + row(item) + ")";
+    if (++count % kRowsOfAStatement == 0) write(std::exchange(values, {}));
+  }
+  if (!values.empty()) write(values);
+}
+
+std::string status_values(const FileStatus& status) {
+  return number(status.size) + ", " + number(status.modified) + ", " + number(status.device) +
+         ", " + number(status.inode);
+}
+
+constexpr const char* kChangeColumns =
+    "SELECT id, what, root, folder, path, kind, known, size, modified, device, inode, source "
+    "FROM scan.change ";
+
+/// Every file that the library holds below a folder, with its kind.
+std::string rows_of_library(const std::string& folder) {
+  const auto below = " path ^@ " + literal(folder + "/");
+  const std::string kind_of_list = "CASE WHEN path ILIKE '%.cue' THEN 4 ELSE 3 END";
+  return "(SELECT path, 0 AS kind, userid <> 0 AS personal FROM track WHERE is_virtual = 'FALSE' "
+         "AND" +
+         below + " UNION SELECT path, 0, false FROM music WHERE" + below +
+         " AND NOT EXISTS (SELECT 1 FROM track t WHERE t.path = music.path AND is_virtual = 'FALSE')"
+         " UNION SELECT path, 1, false FROM photo WHERE" +
+         below + " UNION SELECT path, 2, false FROM video WHERE" + below + " UNION SELECT path, " +
+         kind_of_list + ", false FROM playlist WHERE" + below + " UNION SELECT path, " +
+         kind_of_list + ", true FROM personal_playlist WHERE" + below + ")";
+}
+
+// Audio files whose rows go or are replaced.
+const std::string kTouchedAudio =
+    "(SELECT path FROM scan.change WHERE kind = 0 AND what IN (1, 2, 4, 5, 6, 9))";
+// Audio files that come, change or go, under each of their names.
+const std::string kChangedAudio = "(SELECT path FROM scan.change WHERE kind = 0)";
+const std::string kTouchedSheets =
+    "(SELECT path FROM scan.change WHERE kind = 4 AND what IN (1, 2, 4, 5, 6, 9))";
+
+}  // namespace
+
+void ScanState::begin() {
+  const auto now = std::chrono::steady_clock::now().time_since_epoch().count();
+  token_ = std::to_string(getpid()) + "-" + std::to_string(now);
+  database_.run("DELETE FROM scan.change");
+  database_.query("SELECT set_config('mediidx.scan', " + literal(token_) + ", false)");
+}
+
+void ScanState::check_token() {
+  auto rows = database_.query("SELECT current_setting('mediidx.scan', true) AS token");
+  if (rows.next() && rows.text("token") == token_) return;
+  throw DatabaseLost("the connection to the database was lost");
+}
+
+KnownRoot ScanState::root(const std::string& path) {
+  for (int attempt = 0; attempt < 2; ++attempt) {
+    auto rows =
+        database_.query("SELECT id, volume, away FROM scan.root WHERE path = " + literal(path) +
+                        " ORDER BY id LIMIT 1");
+    if (rows.next()) {
+      return {static_cast<int>(rows.number("id")), rows.text("volume"), rows.flag("away")};
+    }
+    database_.run("INSERT INTO scan.root(path, volume) VALUES(" + literal(path) + ", '')");
+  }
+  throw std::runtime_error("a folder could not be noted: " + path);
+}
+
+void ScanState::set_root(int id, const std::string& volume, bool away) {
+  database_.run("UPDATE scan.root SET volume = " + literal(volume) + ", away = " +
+                (away ? "true" : "false") + ", scanned = now() WHERE id = " + number(id));
+}
+
+std::int64_t ScanState::count_files(const std::string& folder) {
+  auto rows = database_.query(
+      "SELECT count(*) AS files FROM scan.file x JOIN scan.folder f ON x.folder = f.id "
+      "WHERE x.size <> -1 AND x.failure IS NULL AND " +
+      in_folder(folder));
+  return rows.next() ? rows.number("files") : 0;
+}
+
+void ScanState::reconcile(const std::string& folder) {
+  mark_lost(folder);
+  take_up(folder);
+}
+
+void ScanState::mark_lost(const std::string& folder) {
+  struct Held {
+    const char* files;
+    const char* table;
+  };
+  constexpr Held kHeld[] = {
+      {"x.kind = 0", "track h WHERE h.is_virtual = 'FALSE' AND"},
+      {"x.kind = 0 AND NOT f.personal", "music h WHERE"},
+      {"x.kind = 1", "photo h WHERE"},
+      {"x.kind = 2", "video h WHERE"},
+      {"x.kind IN (3, 4) AND NOT f.personal", "playlist h WHERE"},
+      {"x.kind IN (3, 4) AND f.personal", "personal_playlist h WHERE"},
+  };
+  for (const auto& held : kHeld) {
+    database_.run("UPDATE scan.file x SET size = -1 FROM scan.folder f WHERE x.folder = f.id AND " +
+                  in_folder(folder) + " AND x.size >= 0 AND x.failure IS NULL AND " + held.files +
+                  " AND NOT EXISTS (SELECT 1 FROM " + held.table +
+                  " h.path = f.path || '/' || x.name)");
+  }
+  for (const char* table :
+       {"directory h WHERE NOT f.personal AND", "personal_directory h WHERE f.personal AND"}) {
+    const std::string personal =
+        std::string(table).starts_with("p") ? "f.personal" : "NOT f.personal";
+    database_.run("UPDATE scan.folder f SET modified = NULL WHERE " + in_folder(folder) +
+                  " AND f.modified IS NOT NULL AND " + personal +
+                  " AND NOT EXISTS (SELECT 1 FROM " + table + " h.path = f.path)");
+  }
+}
+
+void ScanState::take_up(const std::string& folder) {
+  const auto unknown = "FROM " + rows_of_library(folder) +
+                       " r WHERE NOT EXISTS (SELECT 1 FROM scan.file x JOIN scan.folder f "
+                       "ON x.folder = f.id WHERE f.path || '/' || x.name = r.path)";
+  const std::string parent_of_row = "regexp_replace(r.path, '/[^/]*$', '')";
+  auto any = database_.query("SELECT 1 AS one " + unknown + " LIMIT 1");
+  int taken = 0;
+  if (any.next()) {
+    taken = database_.run(
+        "INSERT INTO scan.folder(path, parent, personal) SELECT DISTINCT ON (n.path) n.path, "
+        "regexp_replace(n.path, '/[^/]*$', ''), n.personal FROM (SELECT " +
+        parent_of_row + " AS path, r.personal " + unknown +
+        ") n WHERE NOT EXISTS (SELECT 1 FROM scan.folder f WHERE f.path = n.path)");
+    database_.run(
+        "INSERT INTO scan.file(folder, name, kind, size, modified, device, inode) "
+        "SELECT at.id, regexp_replace(n.path, '^.*/', ''), n.kind, -2, 0, 0, 0 FROM "
+        "(SELECT r.path, r.kind, " +
+        parent_of_row + " AS parent " + unknown +
+        ") n JOIN scan.folder at ON at.path = n.parent "
+        "WHERE octet_length(n.path) - octet_length(n.parent) <= 256 ON CONFLICT DO NOTHING");
+  }
+  for (const char* table : {"directory", "personal_directory"}) {
+    taken += database_.run(
+        "INSERT INTO scan.folder(path, parent, personal, modified) SELECT DISTINCT d.path, "
+        "regexp_replace(d.path, '/[^/]*$', ''), " +
+        std::string(table[0] == 'p' ? "true" : "false") + ", 0 FROM " + table +
+        " d WHERE (d.path = " + literal(folder) + " OR d.path ^@ " + literal(folder + "/") +
+        ") AND NOT EXISTS (SELECT 1 FROM scan.folder f WHERE f.path = d.path)");
+  }
+  // A folder that is gone is missed in its parent, which therefore has to be known.
+  while (taken > 0) {
+    taken = database_.run(
+        "INSERT INTO scan.folder(path, parent, personal) SELECT DISTINCT f.parent, "
+        "regexp_replace(f.parent, '/[^/]*$', ''), f.personal FROM scan.folder f WHERE f.parent ^@ " +
+        literal(folder + "/") +
+        " AND NOT EXISTS (SELECT 1 FROM scan.folder g WHERE g.path = f.parent)");
+  }
+}
+
+std::map<std::string, KnownFolder> ScanState::look_up(std::span<const ListedFolder> folders) {
+  std::map<std::string, KnownFolder> out;
+  std::map<int, KnownFolder*> by_id;
+  const auto path_row = [](const ListedFolder& folder) { return literal(folder.found.path); };
+  in_portions(folders, path_row, [&](const std::string& values) {
+    auto rows = database_.query("SELECT f.path, f.id, f.mounted, f.away, f.modified FROM (VALUES " +
+                                values + ") v(path) JOIN scan.folder f ON f.path = v.path");
+    while (rows.next()) {
+      auto& known = out[rows.text("path")];
+      known.id = static_cast<int>(rows.number("id"));
+      known.mounted = rows.flag("mounted");
+      known.away = rows.flag("away");
+      if (!rows.is_null("modified")) known.modified = rows.number("modified");
+    }
+    auto below = database_.query("SELECT f.path, f.parent FROM (VALUES " + values +
+                                 ") v(path) JOIN scan.folder f ON f.parent = v.path");
+    while (below.next()) out[below.text("parent")].subfolders.push_back(below.text("path"));
+  });
+  add_unknown(folders, out);
+  std::vector<int> ids;
+  for (auto& [path, known] : out) {
+    by_id[known.id] = &known;
+    ids.push_back(known.id);
+  }
+  in_portions(
+      ids, [](int id) { return number(id); },
+      [&](const std::string& values) {
+        auto rows = database_.query(
+            "SELECT x.folder, x.name, x.kind, x.size, x.modified, x.failure IS NOT NULL AS failed "
+            "FROM (VALUES " +
+            values + ") v(id) JOIN scan.file x ON x.folder = v.id");
+        while (rows.next()) {
+          by_id.at(static_cast<int>(rows.number("folder")))
+              ->files.push_back({rows.text("name"), static_cast<Kind>(rows.number("kind")),
+                                 rows.number("size"), rows.number("modified"),
+                                 rows.flag("failed")});
+        }
+      });
+  return out;
+}
+
+void ScanState::add_unknown(std::span<const ListedFolder> folders,
+                            std::map<std::string, KnownFolder>& out) {
+  std::vector<const ListedFolder*> unknown;
+  for (const auto& folder : folders) {
+    const auto known = out.find(folder.found.path);
+    if (known == out.end() || known->second.id == 0) unknown.push_back(&folder);
+  }
+  const auto row = [](const ListedFolder* folder) {
+    const auto& path = folder->found.path;
+    return literal(path) + ", " + literal(path.substr(0, path.rfind('/'))) + ", " +
+           (folder->coverage.personal ? "true" : "false");
+  };
+  in_portions(unknown, row, [&](const std::string& values) {
+    auto rows = database_.query("INSERT INTO scan.folder(path, parent, personal) VALUES " + values +
+                                " RETURNING id, path");
+    while (rows.next()) out[rows.text("path")].id = static_cast<int>(rows.number("id"));
+  });
+}
+
+void ScanState::set_folder(int id, bool mounted, bool away, std::optional<std::int64_t> modified) {
+  database_.run("UPDATE scan.folder SET mounted = " + std::string(mounted ? "true" : "false") +
+                ", away = " + (away ? "true" : "false") + ", modified = " +
+                (modified ? number(*modified) : "NULL") + " WHERE id = " + number(id));
+}
+
+// -- The plan ------------------------------------------------------------------------------------
+
+namespace {
+
+Step step_of(const Change& change) {
+  switch (change.what) {
+    case What::kGone:
+    case What::kLeftOut:
+    case What::kGoneWith:
+    case What::kGoneFolder:
+    case What::kLeftOutFolder:
+    case What::kMovedAway:
+      return Step::kRemovals;
+    case What::kNew:
+    case What::kChanged:
+    case What::kAgain:
+    case What::kMoved:
+      break;
+  }
+  if (change.kind == Kind::kCueSheet) return Step::kCueSheets;
+  return change.kind == Kind::kPlaylist ? Step::kPlaylists : Step::kMedia;
+}
+
+}  // namespace
+
+void ScanState::add(std::span<const Change> changes) {
+  const auto row = [](const Change& change) {
+    const bool is_folder = change.is_folder;
+    const auto step =
+        is_folder && step_of(change) != Step::kRemovals ? Step::kFolders : step_of(change);
+    return code(step) + ", " + code(change.what) + ", " + number(change.root) + ", " +
+           (change.folder ? number(change.folder) : "NULL") + ", " + literal(change.path) + ", " +
+           (is_folder ? "NULL" : code(change.kind)) + ", " + number(change.known) + ", " +
+           status_values(change.status);
+  };
+  in_portions(changes, row, [&](const std::string& values) {
+    database_.run(
+        "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, "
+        "device, inode) VALUES " +
+        values);
+  });
+}
+
+void ScanState::add_files_of_lost_folders() {
+  database_.run(
+      "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, device, "
+      "inode) SELECT 0, 6, c.root, f.id, f.path || '/' || x.name, x.kind, "
+      "CASE WHEN x.failure IS NULL THEN x.size ELSE -1 END, x.size, x.modified, x.device, x.inode "
+      "FROM scan.change c JOIN scan.folder f ON f.path = c.path OR f.path ^@ (c.path || '/') "
+      "JOIN scan.file x ON x.folder = f.id WHERE c.what IN (7, 8)");
+}
+
+void ScanState::find_moves() {
+  // Of several that went, or came, with one inode and size each is paired once.
+  database_.run(
+      "WITH pairs AS (SELECT went.id AS went, went.path, came.id AS came, "
+      "row_number() OVER (PARTITION BY went.id ORDER BY came.id) AS first_came, "
+      "row_number() OVER (PARTITION BY came.id ORDER BY went.id) AS first_went "
+      "FROM scan.change went JOIN scan.file x ON x.folder = went.folder "
+      "AND x.name = regexp_replace(went.path, '^.*/', '') JOIN scan.change came "
+      "ON came.device = x.device AND came.inode = x.inode AND came.size = x.size "
+      "AND came.kind = x.kind WHERE went.what IN (4, 6) AND came.what = 0 AND x.size >= 0 "
+      "AND x.failure IS NULL), "
+      "chosen AS (SELECT * FROM pairs WHERE first_came = 1 AND first_went = 1), "
+      "marked AS (UPDATE scan.change c SET what = 9 FROM chosen p WHERE c.id = p.went) "
+      "UPDATE scan.change c SET what = 3, source = p.path FROM chosen p WHERE c.id = p.came");
+}
+
+ScanState::Removal ScanState::removal_of(int root, const std::string& path) {
+  auto rows = database_.query(
+      "SELECT count(*) AS removed FROM scan.change WHERE what IN (4, 5, 6) AND known <> -1 "
+      "AND kind IS NOT NULL AND root = " +
+      number(root));
+  const auto removed = rows.next() ? rows.number("removed") : 0;
+  return {removed, removed > 0 ? count_files(path) : 0};
+}
+
+void ScanState::withdraw_removals(int root) {
+  database_.run("DELETE FROM scan.change WHERE what IN (4, 5, 6, 7, 8) AND root = " + number(root));
+}
+
+void ScanState::withdraw(int root) {
+  database_.run("DELETE FROM scan.change WHERE root = " + number(root));
+}
+
+void ScanState::find_consequences() {
+  database_.run(
+      "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, device, "
+      "inode) SELECT 4, 2, 0, f.id, f.path || '/' || x.name, 4, x.size, x.size, x.modified, "
+      "x.device, x.inode FROM (SELECT DISTINCT v.cue_sheet_path AS path FROM " +
+      kChangedAudio +
+      " a JOIN track t ON t.path = a.path AND t.is_virtual = 'TRUE' "
+      "JOIN virtual_info_track v ON v.track = t.id) s "
+      "JOIN scan.folder f ON f.path = regexp_replace(s.path, '/[^/]*$', '') "
+      "JOIN scan.file x ON x.folder = f.id AND x.name = regexp_replace(s.path, '^.*/', '') "
+      "WHERE x.kind = 4 AND NOT EXISTS (SELECT 1 FROM scan.change c WHERE c.path = s.path)");
+  database_.run(
+      "UPDATE scan.file x SET size = -2 FROM scan.change c WHERE c.what = 2 AND c.folder = x.folder "
+      "AND x.name = regexp_replace(c.path, '^.*/', '')");
+  database_.run(
+      "INSERT INTO scan.unsettled(what, name) "
+      "SELECT 0, a.album FROM " +
+      kTouchedAudio +
+      " c JOIN track t ON t.path = c.path "
+      "AND t.is_virtual = 'FALSE' JOIN album_track a ON a.track = t.id WHERE a.album IS NOT NULL "
+      "UNION SELECT 0, a.album FROM " +
+      kTouchedSheets +
+      " c JOIN virtual_info_track v ON v.cue_sheet_path = c.path JOIN album_track a "
+      "ON a.track = v.track WHERE a.album IS NOT NULL "
+      "UNION SELECT 1, t.path FROM " +
+      kTouchedSheets +
+      " c JOIN virtual_info_track v ON v.cue_sheet_path = c.path JOIN track t ON t.id = v.track");
+}
+
+std::int64_t ScanState::count(Step step) {
+  auto rows =
+      database_.query("SELECT count(*) AS changes FROM scan.change WHERE step = " + code(step));
+  return rows.next() ? rows.number("changes") : 0;
+}
+
+std::vector<Change> ScanState::changes(const std::string& condition, int limit) {
+  check_token();
+  std::vector<Change> out;
+  auto rows = database_.query(kChangeColumns + condition + " ORDER BY id LIMIT " + number(limit));
+  while (rows.next()) {
+    Change change;
+    change.id = rows.number("id");
+    change.what = static_cast<What>(rows.number("what"));
+    change.root = static_cast<int>(rows.number("root"));
+    change.folder = static_cast<int>(rows.number("folder"));
+    change.path = rows.text("path");
+    change.is_folder = rows.is_null("kind");
+    change.kind = static_cast<Kind>(rows.number("kind"));
+    change.known = rows.number("known");
+    change.status.size = rows.number("size");
+    change.status.modified = rows.number("modified");
+    change.status.device = rows.number("device");
+    change.status.inode = rows.number("inode");
+    change.source = rows.text("source");
+    out.push_back(std::move(change));
+  }
+  return out;
+}
+
+std::vector<Change> ScanState::next(Step step, std::int64_t after, int limit) {
+  return changes("WHERE step = " + code(step) + " AND id > " + number(after), limit);
+}
+
+std::vector<Change> ScanState::moves(std::int64_t after, int limit) {
+  return changes("WHERE what = 3 AND id > " + number(after), limit);
+}
+
+// -- What was done -------------------------------------------------------------------------------
+
+void ScanState::save(std::span<const FileState> files) {
+  const auto row = [](const FileState& file) {
+    return number(file.folder) + ", " + literal(file.name) + ", " + code(file.kind) + ", " +
+           status_values(file.status) + ", " +
+           (file.failure.empty() ? "NULL::text" : literal(file.failure));
+  };
+  in_portions(files, row, [&](const std::string& values) {
+    database_.run(
+        "INSERT INTO scan.file(folder, name, kind, size, modified, device, inode, failure) VALUES " +
+        values +
+        " ON CONFLICT (folder, name) DO UPDATE SET kind = excluded.kind, size = excluded.size, "
+        "modified = excluded.modified, device = excluded.device, inode = excluded.inode, "
+        "failure = excluded.failure");
+  });
+}
+
+void ScanState::forget_file(int folder, const std::string& name) {
+  database_.run("DELETE FROM scan.file WHERE folder = " + number(folder) +
+                " AND name = " + literal(name));
+}
+
+void ScanState::forget_path(const std::string& path) {
+  const auto slash = path.rfind('/');
+  database_.run("DELETE FROM scan.file x USING scan.folder f WHERE x.folder = f.id AND f.path = " +
+                literal(path.substr(0, slash)) +
+                " AND x.name = " + literal(path.substr(slash + 1)));
+}
+
+void ScanState::forget_folder(const std::string& path) {
+  database_.run("DELETE FROM scan.folder f WHERE " + in_folder(path));
+}
+
+void ScanState::mark_unsure(int folder, const std::string& name) {
+  database_.run("UPDATE scan.file SET size = -2, failure = NULL WHERE folder = " + number(folder) +
+                " AND name = " + literal(name));
+}
+
+// -- Settling ------------------------------------------------------------------------------------
+
+bool ScanState::has_unsettled() {
+  return database_.query("SELECT 1 AS one FROM scan.unsettled LIMIT 1").next();
+}
+
+std::vector<std::string> ScanState::unsettled_albums() {
+  // What a scan of an empty index leaves: a tagged album artist stays; without one the tracks share
+  // their only artist, or, where they have several, none.
+  auto rows = database_.query(
+      "SELECT album FROM (SELECT a.album, r.artist, r.has_album_artist, a.album_artist, "
+      "a.from_album_artist, min(r.artist) FILTER (WHERE r.has_album_artist = 'FALSE') "
+      "OVER (PARTITION BY a.album) IS DISTINCT FROM max(r.artist) "
+      "FILTER (WHERE r.has_album_artist = 'FALSE') OVER (PARTITION BY a.album) AS many "
+      "FROM album_track a JOIN artist_track r ON r.track = a.track "
+      "WHERE a.album IN (SELECT name FROM scan.unsettled WHERE what = 0)) s "
+      "WHERE CASE WHEN has_album_artist = 'TRUE' THEN from_album_artist = 'FALSE' "
+      "OR album_artist = '' WHEN many THEN from_album_artist = 'FALSE' OR album_artist <> '' "
+      "ELSE from_album_artist = 'TRUE' OR album_artist <> artist END GROUP BY album ORDER BY album");
+  std::vector<std::string> out;
+  while (rows.next()) out.push_back(rows.text("album"));
+  return out;
+}
+
+namespace {
+
+/// Files in the index, by their paths, as changes to be made again.
+std::string plan_again(const std::string& paths) {
+  return "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, "
+         "device, inode) SELECT CASE x.kind WHEN 4 THEN 4 ELSE 2 END, 2, 0, f.id, p.path, x.kind, "
+         "x.size, x.size, x.modified, x.device, x.inode FROM (" +
+         paths +
+         ") p "
+         "JOIN scan.folder f ON f.path = regexp_replace(p.path, '/[^/]*$', '') "
+         "JOIN scan.file x ON x.folder = f.id AND x.name = regexp_replace(p.path, '^.*/', '') "
+         "WHERE x.failure IS NULL ORDER BY p.path";
+}
+
+}  // namespace
+
+void ScanState::plan_unmarked_audio() {
+  database_.run("DELETE FROM scan.change");
+  database_.run(plan_again(
+      "SELECT t.path FROM track t WHERE t.path IN (SELECT name FROM scan.unsettled WHERE what = 1) "
+      "AND t.is_virtual = 'FALSE' AND t.has_virtual = 'TRUE' AND NOT EXISTS (SELECT 1 FROM track v "
+      "WHERE v.path = t.path AND v.is_virtual = 'TRUE')"));
+  find_consequences();
+}
+
+void ScanState::plan_albums(std::span<const std::string> albums) {
+  database_.run("DELETE FROM scan.change");
+  std::string list;
+  for (const auto& album : albums) list += (list.empty() ? "" : ", ") + literal(album);
+  database_.run(
+      plan_again("SELECT DISTINCT coalesce(v.cue_sheet_path, t.path) AS path FROM album_track a "
+                 "JOIN track t ON t.id = a.track LEFT JOIN virtual_info_track v ON v.track = t.id "
+                 "WHERE a.album IN (" +
+                 list + ")"));
+  find_consequences();
+}
+
+void ScanState::settled() { database_.run("DELETE FROM scan.unsettled"); }
+
+}  // namespace mediidx::tool

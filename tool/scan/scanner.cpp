@@ -1,0 +1,535 @@
+// SPDX-FileCopyrightText: The mediidx developers
+// SPDX-License-Identifier: MIT
+
+// The frame of a scan, and its second half: doing what was planned.
+#include "scan/scanner.h"
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <tavoindex.h>
+#include <tavosdk.h>
+#include <unistd.h>
+
+#include <algorithm>
+#include <cerrno>
+#include <chrono>
+#include <cstring>
+#include <deque>
+#include <filesystem>
+#include <memory>
+#include <thread>
+
+#include "mediidx/database.h"
+#include "mediidx/request.h"
+#include "store/query.h"
+#include "support/text.h"
+#include "tags/file_times.h"
+#include "tags/volume_id.h"
+
+namespace mediidx::tool {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr int kPage = 500;
+constexpr std::size_t kBatch = 100;
+constexpr std::size_t kInFlight = 128;
+constexpr auto kPatience = std::chrono::seconds(60);
+constexpr auto kBetweenTries = std::chrono::milliseconds(500);
+// The kernel's clock of files ticks every few milliseconds: a file written twice within a tick, and
+// read between, would look unchanged.
+constexpr std::int64_t kTick = 50'000'000;
+
+std::string name_of(const std::string& path) { return path.substr(path.rfind('/') + 1); }
+
+std::int64_t now() {
+  timespec time{};
+  clock_gettime(CLOCK_REALTIME, &time);
+  return std::int64_t{time.tv_sec} * 1'000'000'000 + time.tv_nsec;
+}
+
+FileStamp stamp_of(const std::string& path) {
+  struct stat status{};
+  if (stat(path.c_str(), &status) != 0) return {};
+  return {status.st_size, status.st_mtim.tv_sec, static_cast<std::int32_t>(status.st_mtim.tv_nsec)};
+}
+
+/// Playlists and cue sheets have no tags: only the file system is asked.
+TagAnswer read_here(const Change& change) {
+  TagAnswer answer;
+  answer.before = stamp_of(change.path);
+  try {
+    answer.file = read_media_file(change.path, change.kind);
+    answer.outcome = TagAnswer::Outcome::kRead;
+  } catch (const ReadError& error) {
+    answer.outcome = TagAnswer::Outcome::kUnreadable;
+    answer.error = access(change.path.c_str(), R_OK) == 0 ? EIO : errno;
+    answer.reason = error.what();
+  }
+  answer.after = stamp_of(change.path);
+  return answer;
+}
+
+std::unique_ptr<DIR_INFO_REC> folder_record(const std::string& path, std::int64_t& modified) {
+  auto record = std::make_unique<DIR_INFO_REC>();
+  copy_text(record->path, path);
+  copy_text(record->title, name_of(path));
+  copy_text(record->fs_uuid, volume_id(path));
+  struct statx status{};
+  if (statx(AT_FDCWD, path.c_str(), 0, STATX_BASIC_STATS | STATX_BTIME, &status) == 0) {
+    const auto times = file_times(status);
+    copy_text(record->date, times.created);
+    copy_text(record->mdate, times.modified);
+    modified = status.stx_mtime.tv_sec * 1'000'000'000 + status.stx_mtime.tv_nsec;
+  }
+  return record;
+}
+
+bool add(const MediaFile& file) {
+  const auto json = to_json(file);
+  const auto table = table_of(file.kind);
+  // Only the JSON request takes replay gain.
+  if (file.gain.track_gain) return TAVOMediaIndexAdd_Json(json, table) == 0;
+  const auto record = std::make_unique<__tag_TAVO_MEDIA_INFO>();
+  return MediaInfoJson2Object(json, record.get()) == 0 &&
+         TAVOMediaIndexAdd(record.get(), table) == 0;
+}
+
+}  // namespace
+
+Scanner::Scanner(Database& database, const DataFolder& data, TagWorkers& workers,
+                 ScanOptions options, ScanHooks hooks)
+    : database_(database),
+      data_(data),
+      workers_(workers),
+      options_(options),
+      hooks_(std::move(hooks)),
+      state_(database) {}
+
+bool Scanner::stops() {
+  report_.is_stopped = report_.is_stopped || hooks_.must_stop();
+  return report_.is_stopped;
+}
+
+void Scanner::check_configuration() {
+  if (hooks_.reload()) is_reconfigured_ = true;
+}
+
+ScanReport Scanner::run(const std::vector<std::string>& folders) {
+  for (;;) {
+    try {
+      run_once(folders);
+      report_.skipped += report_.unstorable;
+      return report_;
+    } catch (const DatabaseLost&) {
+      if (options_.dry_run) throw;
+    } catch (const std::runtime_error&) {
+      if (options_.dry_run || database_.answers()) throw;
+    }
+    wait_for_database();
+    if (report_.is_stopped) return report_;
+  }
+}
+
+void Scanner::wait_for_database() {
+  hooks_.say("the database does not answer: waiting for it");
+  const auto deadline = std::chrono::steady_clock::now() + kPatience;
+  while (!database_.reconnect()) {
+    if (stops()) return;
+    if (std::chrono::steady_clock::now() > deadline) {
+      throw DatabaseLost("the database no longer answers: " + database_.last_error());
+    }
+    std::this_thread::sleep_for(kBetweenTries);
+  }
+  hooks_.say("the database is back");
+}
+
+void Scanner::run_once(const std::vector<std::string>& folders) {
+  report_.skipped = 0;
+  report_.switched_off = 0;
+  report_.offline = 0;
+  report_.is_away = false;
+  report_.is_refused = false;
+  is_settling_ = false;
+  is_reconfigured_ = false;
+  away_.clear();
+  batch_.clear();
+  in_hand_.clear();
+  while (workers_.outstanding() > 0) workers_.take(kBetweenTries);
+
+  if (options_.dry_run) database_.run("BEGIN");
+  state_.begin();
+  starts_ = starts_for(folders);
+  plan();
+  if (options_.dry_run) {
+    count_plan();
+    database_.run("ROLLBACK");
+    return;
+  }
+  if (!stops()) apply();
+  if (!stops()) settle();
+}
+
+// -- Doing ---------------------------------------------------------------------------------------
+
+void Scanner::apply() {
+  std::size_t total = 0;
+  for (const auto step :
+       {Step::kRemovals, Step::kFolders, Step::kMedia, Step::kPlaylists, Step::kCueSheets}) {
+    total += static_cast<std::size_t>(state_.count(step));
+  }
+  hooks_.start(total);
+  apply_step(
+      Step::kRemovals, [this](const Change& change) { return remove(change); },
+      [this](const Change& change) {
+        const bool is_counted = !change.is_folder && change.what != What::kMovedAway;
+        if (is_counted && change.known != -1) ++report_.removed;
+      });
+  move_attributes();
+  apply_step(
+      Step::kFolders, [this](const Change& change) { return save_folder(change); },
+      [this](const Change&) { ++report_.folders; });
+  for (const auto step : {Step::kMedia, Step::kPlaylists, Step::kCueSheets}) save_files(step);
+}
+
+void Scanner::roll_back() {
+  try {
+    database_.run("ROLLBACK");
+  } catch (const std::runtime_error&) {
+    // There is nothing to be undone where there is no connection.
+  }
+  if (!database_.answers()) throw DatabaseLost("the database no longer answers");
+}
+
+void Scanner::apply_step(Step step, const std::function<bool(const Change&)>& take,
+                         const std::function<void(const Change&)>& count) {
+  std::int64_t after = 0;
+  for (;;) {
+    const auto page = state_.next(step, after, kPage);
+    if (page.empty() || stops()) return;
+    after = page.back().id;
+    bool is_done = false;
+    try {
+      database_.run("BEGIN");
+      is_done = std::ranges::all_of(page, take);
+      if (is_done) database_.run("COMMIT");
+    } catch (const std::runtime_error&) {
+      is_done = false;
+    }
+    if (!is_done) roll_back();
+    for (const auto& change : page) {
+      hooks_.step(change.path);
+      if (is_done || take(change)) {
+        count(change);
+      } else {
+        fail_in_database(change);
+      }
+    }
+    check_configuration();
+  }
+}
+
+bool Scanner::remove(const Change& change) {
+  const auto& path = change.path;
+  if (change.is_folder) {
+    if (change.what == What::kLeftOut) {
+      if (MediaInfoDBDelete(MEDIA_TABLE_DIRECTORY, path.c_str()) != 0) return false;
+      state_.set_folder(change.folder, false, false, std::nullopt);
+      return true;
+    }
+    // What is there again will be found again.
+    const bool is_gone = change.what == What::kGoneFolder;
+    const int result =
+        is_gone ? TAVOMediaIndexDirDelete(path.c_str()) : TAVOMediaIndexPreReindex(path.c_str());
+    if (result < 0) return false;
+    state_.forget_folder(path);
+    return true;
+  }
+  if (change.what == What::kMovedAway) return true;
+  // The folder takes its files along, but not what its cue sheets cut out of files elsewhere.
+  if (change.what == What::kGoneWith && change.kind != Kind::kCueSheet) return true;
+  const bool is_there = look_at(path) != Presence::kGone;
+  if (is_there && change.what == What::kGone) return true;
+  const int result = is_there ? MediaInfoDBDelete(table_of(change.kind), path.c_str())
+                              : TAVOMediaIndexDelete(path.c_str());
+  if (result != 0) return false;
+  if (change.what != What::kGoneWith) state_.forget_file(change.folder, name_of(path));
+  return true;
+}
+
+void Scanner::move_attributes() {
+  std::int64_t after = 0;
+  for (;;) {
+    const auto page = state_.moves(after, kPage);
+    if (page.empty()) return;
+    after = page.back().id;
+    for (const auto& change : page) {
+      std::array<char, MEDIIDX_PATH_SIZE> from{};
+      std::array<char, MEDIIDX_PATH_SIZE> to{};
+      const auto size = static_cast<int>(from.size() - 1);
+      if (TAVOEADirPath(0, change.source.c_str(), from.data(), size) < 0 ||
+          TAVOEADirPath(0, change.path.c_str(), to.data(), size) < 0) {
+        continue;
+      }
+      std::error_code error;
+      if (!fs::is_directory(from.data(), error) || fs::exists(to.data(), error)) continue;
+      fs::create_directories(fs::path(to.data()).parent_path(), error);
+      fs::rename(from.data(), to.data(), error);
+      if (error) fail(change.path, "its ratings could not follow it: " + error.message());
+    }
+  }
+}
+
+bool Scanner::save_folder(const Change& change) {
+  std::int64_t modified = 0;
+  const auto record = folder_record(change.path, modified);
+  if (look_at(change.path) == Presence::kGone) return true;
+  if (TAVOMediaIndexDirAdd(record.get()) != 0) return false;
+  database_.run("UPDATE scan.folder SET modified = " + std::to_string(modified) +
+                " WHERE id = " + std::to_string(change.folder));
+  return true;
+}
+
+void Scanner::save_files(Step step) {
+  std::deque<Change> queue;
+  std::int64_t after = 0;
+  bool has_more = true;
+  while (!stops()) {
+    if (queue.empty() && has_more) {
+      auto page = state_.next(step, after, kPage);
+      has_more = !page.empty();
+      if (has_more) after = page.back().id;
+      std::ranges::move(page, std::back_inserter(queue));
+    }
+    while (!queue.empty() && in_hand_.size() < kInFlight && batch_.size() < kBatch) {
+      submit(std::move(queue.front()));
+      queue.pop_front();
+    }
+    if (auto answer = in_hand_.empty() ? std::nullopt : workers_.take(kBetweenTries)) {
+      if (auto found = in_hand_.extract(answer->ticket)) {
+        receive({std::move(found.mapped()), std::move(*answer)});
+      }
+    }
+    if (batch_.size() >= kBatch) write_batch();
+    check_configuration();
+    if (queue.empty() && !has_more && in_hand_.empty()) break;
+  }
+  write_batch();
+  in_hand_.clear();
+}
+
+void Scanner::submit(Change change) {
+  hooks_.step(change.path);
+  if (is_reconfigured_ &&
+      TAVOMediaIndexIsIndexPath(change.path.c_str(), table_of(change.kind)) <= 0) {
+    ++report_.skipped;
+    ++report_.switched_off;
+    return;
+  }
+  if (change.kind == Kind::kPlaylist || change.kind == Kind::kCueSheet) {
+    auto answer = read_here(change);
+    return receive({std::move(change), std::move(answer)});
+  }
+  const auto ticket = ++last_ticket_;
+  workers_.submit({ticket, change.path, change.kind});
+  in_hand_.emplace(ticket, std::move(change));
+}
+
+void Scanner::receive(Ready ready) {
+  if (ready.answer.outcome == TagAnswer::Outcome::kUnreadable) {
+    // What was deleted meanwhile is missed by the next scan. Of others the rows stay.
+    if (ready.answer.error != ENOENT) fail(ready.change.path, ready.answer.reason);
+    return;
+  }
+  batch_.push_back(std::move(ready));
+}
+
+void Scanner::write_batch() {
+  if (batch_.empty()) return;
+  bool is_done = false;
+  try {
+    database_.run("BEGIN");
+    is_done = std::ranges::all_of(batch_, [this](const Ready& ready) { return save(ready); });
+    if (is_done) {
+      std::vector<FileState> states;
+      for (const auto& ready : batch_) states.push_back(state_of(ready));
+      state_.save(states);
+      database_.run("COMMIT");
+    }
+  } catch (const std::runtime_error&) {
+    is_done = false;
+  }
+  if (is_done) {
+    for (const auto& ready : batch_) count_saved(ready);
+  } else {
+    roll_back();
+    for (const auto& ready : batch_) write_alone(ready);
+  }
+  batch_.clear();
+}
+
+/// Without a transaction, as the library means its requests: a statement that fails costs itself.
+void Scanner::write_alone(const Ready& ready) {
+  const auto& change = ready.change;
+  if (change.folder != 0) state_.mark_unsure(change.folder, name_of(change.path));
+  auto state = state_of(ready);
+  if (save(ready)) {
+    count_saved(ready);
+  } else {
+    const auto reason = fail_in_database(change);
+    // A sheet's text will not do better next time.
+    if (change.kind != Kind::kCueSheet) return;
+    state.failure = reason;
+  }
+  state_.save({&state, 1});
+}
+
+bool Scanner::save(const Ready& ready) {
+  const auto& change = ready.change;
+  const bool is_read = ready.answer.outcome == TagAnswer::Outcome::kRead;
+  if (!(is_read ? request(ready) : drop(ready))) return false;
+  if (change.what == What::kMoved) state_.forget_path(change.source);
+  return true;
+}
+
+bool Scanner::request(const Ready& ready) {
+  const auto& change = ready.change;
+  if (change.what != What::kMoved) return add(ready.answer.file);
+  // It reports a failure in any case; the rows tell.
+  TAVOMediaIndexRename_Json(to_json(ready.answer.file), table_of(change.kind),
+                            change.source.c_str());
+  return is_in_index(change);
+}
+
+/// A file that can no longer be understood has no rows, as if it had always been so.
+bool Scanner::drop(const Ready& ready) {
+  const auto& change = ready.change;
+  if (change.what == What::kMoved && TAVOMediaIndexDelete(change.source.c_str()) != 0) return false;
+  if (change.what == What::kNew || change.what == What::kMoved || change.known == -1) return true;
+  return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;
+}
+
+FileState Scanner::state_of(const Ready& ready) const {
+  const auto& change = ready.change;
+  const auto& answer = ready.answer;
+  FileState out{change.folder, name_of(change.path), change.kind, change.status, {}};
+  if (answer.outcome != TagAnswer::Outcome::kRead) {
+    out.failure = answer.reason;
+    return out;
+  }
+  const auto& before = answer.before;
+  out.status.size = before.size;
+  out.status.modified = before.seconds * 1'000'000'000 + before.nanoseconds;
+  const bool is_settled = before == answer.after && now() - out.status.modified > kTick;
+  if (!is_settled) out.status.size = -2;
+  return out;
+}
+
+bool Scanner::is_in_index(const Change& change) {
+  const char* tables[] = {"track WHERE is_virtual = 'FALSE' AND", "photo WHERE", "video WHERE",
+                          "playlist WHERE", "playlist WHERE"};
+  const auto path = " path = " + literal(change.path);
+  auto sql = std::string("SELECT EXISTS (SELECT 1 FROM ") +
+             tables[static_cast<std::size_t>(change.kind)] + path + ")";
+  if (table_of(change.kind) == MEDIA_TABLE_PLAYLIST) {
+    sql += " OR EXISTS (SELECT 1 FROM personal_playlist WHERE" + path + ")";
+  }
+  auto rows = database_.query(sql + " AS found");
+  return rows.next() && rows.flag("found");
+}
+
+void Scanner::count_saved(const Ready& ready) {
+  if (ready.answer.outcome != TagAnswer::Outcome::kRead) {
+    fail(ready.change.path, ready.answer.reason);
+    return;
+  }
+  if (is_settling_) return;
+  ++report_.saved[static_cast<std::size_t>(ready.change.kind)];
+  switch (ready.change.what) {
+    case What::kNew:
+      ++report_.added;
+      break;
+    case What::kMoved:
+      ++report_.moved;
+      break;
+    case What::kChanged:
+      ++report_.changed;
+      break;
+    default:
+      break;
+  }
+}
+
+void Scanner::fail(const std::string& path, const std::string& reason) {
+  ++report_.failed;
+  hooks_.fail({path, reason, false});
+}
+
+std::string Scanner::fail_in_database(const Change& change) {
+  auto reason = database_.last_error();
+  if (!database_.answers()) throw DatabaseLost("the database no longer answers");
+  const bool is_cue_sheet = !change.is_folder && change.kind == Kind::kCueSheet;
+  if (reason.empty()) {
+    reason = is_cue_sheet ? "the cue sheet cannot be understood" : "the index could not be changed";
+  } else if (is_cue_sheet) {
+    reason = "the sheet's tracks: " + reason;
+  }
+  fail(change.path, reason);
+  return reason;
+}
+
+// -- Settling ------------------------------------------------------------------------------------
+
+void Scanner::settle() {
+  if (!state_.has_unsettled()) return;
+  is_settling_ = true;
+  const auto save_all = [this] {
+    for (const auto step : {Step::kMedia, Step::kPlaylists, Step::kCueSheets}) save_files(step);
+  };
+  state_.plan_unmarked_audio();
+  save_all();
+  // Sheets tie albums together: to save one anew may unsettle another, so that the set grows until
+  // it holds all that belong together.
+  std::set<std::string> albums;
+  for (;;) {
+    const auto bad = state_.unsettled_albums();
+    const auto known = albums.size();
+    albums.insert(bad.begin(), bad.end());
+    if (bad.empty() || albums.size() == known) break;
+    state_.plan_albums(std::vector<std::string>(albums.begin(), albums.end()));
+    if (!can_be_read_again()) return;
+    remove_before_saving();
+    save_all();
+    if (stops()) return;
+  }
+  state_.settled();
+}
+
+/// What is taken out of the index has to come back: with a file that cannot be read now, the album
+/// has to wait.
+bool Scanner::can_be_read_again() {
+  for (const auto step : {Step::kMedia, Step::kCueSheets}) {
+    std::int64_t after = 0;
+    for (auto page = state_.next(step, after, kPage); !page.empty();
+         page = state_.next(step, after, kPage)) {
+      after = page.back().id;
+      const bool can_all = std::ranges::all_of(
+          page, [](const Change& change) { return access(change.path.c_str(), R_OK) == 0; });
+      if (!can_all) return false;
+    }
+  }
+  return true;
+}
+
+void Scanner::remove_before_saving() {
+  for (const auto step : {Step::kMedia, Step::kCueSheets}) {
+    apply_step(
+        step,
+        [](const Change& change) {
+          return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;
+        },
+        [](const Change&) {});
+  }
+}
+
+}  // namespace mediidx::tool

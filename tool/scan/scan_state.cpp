@@ -78,10 +78,13 @@ void ScanState::begin() {
   database_.query("SELECT set_config('mediidx.scan', " + literal(token_) + ", false)");
 }
 
-void ScanState::check_token() {
-  auto rows = database_.query("SELECT current_setting('mediidx.scan', true) AS token");
-  if (rows.next() && rows.text("token") == token_) return;
-  throw DatabaseLost("the connection to the database was lost");
+bool ScanState::is_same_connection() {
+  try {
+    auto rows = database_.query("SELECT current_setting('mediidx.scan', true) AS token");
+    return rows.next() && rows.text("token") == token_;
+  } catch (const std::runtime_error&) {
+    return false;
+  }
 }
 
 KnownRoot ScanState::root(const std::string& path) {
@@ -370,7 +373,7 @@ std::int64_t ScanState::count(Step step) {
 }
 
 std::vector<Change> ScanState::changes(const std::string& condition, int limit) {
-  check_token();
+  if (!is_same_connection()) throw DatabaseLost("the connection to the database was lost");
   std::vector<Change> out;
   auto rows = database_.query(kChangeColumns + condition + " ORDER BY id LIMIT " + number(limit));
   while (rows.next()) {

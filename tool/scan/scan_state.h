@@ -99,6 +99,8 @@ class ScanState {
 
   /// Forgets what an earlier scan had planned.
   void begin();
+  /// False when the connection was lost since then, also when there is another one by now.
+  bool is_same_connection();
 
   KnownRoot root(const std::string& path);
   void set_root(int id, const std::string& volume, bool away);
@@ -160,7 +162,6 @@ class ScanState {
   void add_unknown(std::span<const ListedFolder> folders, std::map<std::string, KnownFolder>& out);
   void mark_lost(const std::string& folder);
   void take_up(const std::string& folder);
-  void check_token();
   std::vector<Change> changes(const std::string& condition, int limit);
 
   Database& database_;

@@ -124,7 +124,7 @@ ScanReport Scanner::run(const std::vector<std::string>& folders) {
     } catch (const DatabaseLost&) {
       if (options_.dry_run) throw;
     } catch (const std::runtime_error&) {
-      if (options_.dry_run || database_.answers()) throw;
+      if (options_.dry_run || state_.is_same_connection()) throw;
     }
     wait_for_database();
     if (report_.is_stopped) return report_;
@@ -198,7 +198,12 @@ void Scanner::roll_back() {
   } catch (const std::runtime_error&) {
     // There is nothing to be undone where there is no connection.
   }
-  if (!database_.answers()) throw DatabaseLost("the database no longer answers");
+  check_connection();
+}
+
+/// What fails with the connection is the connection's failure, not a file's.
+void Scanner::check_connection() {
+  if (!state_.is_same_connection()) throw DatabaseLost("the connection to the database was lost");
 }
 
 void Scanner::apply_step(Step step, const std::function<bool(const Change&)>& take,
@@ -401,11 +406,13 @@ bool Scanner::request(const Ready& ready) {
   return is_in_index(change);
 }
 
-/// A file that can no longer be understood has no rows, as if it had always been so.
+/// A file that can no longer be understood has no rows, as if it had always been so. Where its
+/// reader was lost, by the file or by a disk that hangs, what was known of it stays.
 bool Scanner::drop(const Ready& ready) {
   const auto& change = ready.change;
   if (change.what == What::kMoved && TAVOMediaIndexDelete(change.source.c_str()) != 0) return false;
   if (change.what == What::kNew || change.what == What::kMoved || change.known == -1) return true;
+  if (ready.answer.outcome == TagAnswer::Outcome::kLost) return true;
   return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;
 }
 
@@ -467,7 +474,7 @@ void Scanner::fail(const std::string& path, const std::string& reason) {
 
 std::string Scanner::fail_in_database(const Change& change) {
   auto reason = database_.last_error();
-  if (!database_.answers()) throw DatabaseLost("the database no longer answers");
+  check_connection();
   const bool is_cue_sheet = !change.is_folder && change.kind == Kind::kCueSheet;
   if (reason.empty()) {
     reason = is_cue_sheet ? "the cue sheet cannot be understood" : "the index could not be changed";

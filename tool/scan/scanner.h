@@ -111,6 +111,7 @@ class Scanner {
   void apply_step(Step step, const std::function<bool(const Change&)>& take,
                   const std::function<void(const Change&)>& count);
   void roll_back();
+  void check_connection();
   void move_attributes();
   bool remove(const Change& change);
   bool save_folder(const Change& change);

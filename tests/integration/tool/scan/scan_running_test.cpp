@@ -27,6 +27,14 @@ class ARunningScan : public ScanTest {
   }
   /// The folder is chosen, and holds nothing yet.
   void choose() { index(); }
+  /// The readers of tags of a running scan.
+  static std::vector<pid_t> workers_of(pid_t scan) {
+    const auto task = "/proc/" + std::to_string(scan) + "/task/" + std::to_string(scan);
+    std::ifstream in(task + "/children");
+    std::vector<pid_t> out;
+    for (pid_t pid = 0; in >> pid;) out.push_back(pid);
+    return out;
+  }
   /// Waits until the running scan has saved something.
   void wait_for_rows() {
     for (int i = 0; i < 6000 && count("track") == 0; ++i) {
@@ -68,10 +76,10 @@ TEST_F(ARunningScan, OutlivesAFileThatKillsItsReader) {
   choose();
   fill(50);
   Setting setting;
-  setting.meanwhile = [this](pid_t) {
+  setting.meanwhile = [this](pid_t scan) {
     // Whatever a worker reads when this comes, its death costs that file alone.
     wait_for_rows();
-    for (const auto pid : processes_with("--tag-worker")) kill(pid, SIGSEGV);
+    for (const auto pid : workers_of(scan)) kill(pid, SIGABRT);
   };
   fill(0);
   for (int i = 100; i < 2500; ++i) {
@@ -299,8 +307,7 @@ TEST_F(ARunningScan, RunsIdleUnlessItShallNot) {
     int policy = -1;
     Setting setting;
     setting.meanwhile = [&](pid_t pid) {
-      const auto file = data.at("d/root/var/run/tavoindexd.pid");
-      for (int i = 0; i < 3000 && processes_with("--tag-worker").empty(); ++i) {
+      for (int i = 0; i < 3000 && workers_of(pid).empty(); ++i) {
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
       }
       policy = sched_getscheduler(pid);

@@ -95,10 +95,12 @@ std::string progress_json(const ProgressState& state, const std::string& path) {
   return Json::writeString(builder, object);
 }
 
-Progress::Progress(bool as_json)
-    : as_json_(as_json),
-      on_terminal_(!as_json && isatty(STDERR_FILENO) == 1),
-      next_(on_terminal_ || as_json ? Clock::now() : Clock::now() + kBetweenLines) {}
+Progress::Progress(Style style)
+    : as_json_(style == Style::kJson),
+      on_terminal_(!as_json_ && isatty(STDERR_FILENO) == 1),
+      next_(on_terminal_ || as_json_ ? Clock::now() : Clock::now() + kBetweenLines) {}
+
+Progress::Progress(std::size_t total) : Progress(Style::kForPeople) { start(total); }
 
 Progress::~Progress() { clear(); }
 

@@ -36,7 +36,11 @@ std::string progress_json(const ProgressState& state, const std::string& path);
 /// The bar goes with the object.
 class Progress {
  public:
-  explicit Progress(bool as_json);
+  enum class Style { kForPeople, kJson };
+
+  explicit Progress(Style style);
+  /// So much is to be done, and told to people.
+  explicit Progress(std::size_t total);
   ~Progress();
   Progress(const Progress&) = delete;
   Progress& operator=(const Progress&) = delete;

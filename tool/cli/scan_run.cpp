@@ -42,7 +42,7 @@ ScanReport run_scanner(const DataFolder& data, Database& database,
                        const std::vector<std::string>& folders, const ScanSetting& setting) {
   if (!setting.full_speed) become_idle();
   TagWorkers workers(std::max(1U, std::thread::hardware_concurrency()));
-  Progress progress(setting.json_progress);
+  Progress progress(setting.json_progress ? Progress::Style::kJson : Progress::Style::kForPeople);
   ScanHooks hooks;
   hooks.must_stop = [] { return noted_signal() != 0; };
   hooks.reload = [] {

@@ -43,10 +43,11 @@ constexpr const char* kSelectCollation =
     "SELECT datcollversion AS recorded, pg_database_collation_actual_version(oid) AS actual "
     "FROM pg_database WHERE datname = current_database()";
 constexpr const char* kSelectObjects =
-    "SELECT n.nspname || '.' || c.relname AS name, coalesce(i.indisvalid, true) AS valid "
+    "SELECT CASE WHEN i.indexrelid IS NULL THEN n.nspname ELSE 'public' END || '.' || c.relname "
+    "AS name, coalesce(i.indisvalid, true) AS valid "
     "FROM pg_class c JOIN pg_namespace n ON n.oid = c.relnamespace "
     "LEFT JOIN pg_index i ON i.indexrelid = c.oid "
-    "WHERE n.nspname IN ('public', 'mediidx')";
+    "WHERE n.nspname IN ('public', 'mediidx', 'scan')";
 constexpr const char* kCountFolders =
     "SELECT (SELECT count(*) FROM directory) + (SELECT count(*) FROM personal_directory) AS folders";
 

@@ -15,6 +15,7 @@
 #include "mediidx/index_folder_action.h"
 #include "mediidx/record.h"
 #include "mediidx/request.h"
+#include "scan/scan_state.h"
 #include "scan/share_file.h"
 #include "store/data_folder.h"
 #include "store/database.h"
@@ -87,7 +88,8 @@ int drop_folder(const DataFolder& data, const std::string& folder) {
                              " is not there, and the index-folder configuration does not tell "
                              "whether it was given up: its index is kept");
   }
-  const Database database(data);
+  Database database(data);
+  ScanState(database).unsettle_below(folder);
   const int result =
       exists ? TAVOMediaIndexPreReindex(folder.c_str()) : TAVOMediaIndexDirDelete(folder.c_str());
   if (result >= 0) return kExitDone;

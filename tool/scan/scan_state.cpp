@@ -113,6 +113,13 @@ std::int64_t ScanState::count_files(const std::string& folder) {
   return rows.next() ? rows.number("files") : 0;
 }
 
+bool ScanState::holds_anything(const std::string& folder) {
+  const auto below = literal(folder + "/");
+  auto folders =
+      database_.query("SELECT 1 AS one FROM scan.folder WHERE path ^@ " + below + " LIMIT 1");
+  return folders.next() || count_files(folder) > 0;
+}
+
 void ScanState::reconcile(const std::string& folder) {
   mark_lost(folder);
   take_up(folder);
@@ -444,6 +451,21 @@ void ScanState::mark_unsure(int folder, const std::string& name) {
 }
 
 // -- Settling ------------------------------------------------------------------------------------
+
+void ScanState::unsettle_below(const std::string& folder) {
+  const auto below = " ^@ " + literal(folder + "/");
+  database_.run(
+      "INSERT INTO scan.unsettled(what, name) "
+      "SELECT 0, a.album FROM track t JOIN album_track a ON a.track = t.id "
+      "WHERE a.album IS NOT NULL AND t.path" +
+      below +
+      " UNION SELECT 0, a.album FROM virtual_info_track v JOIN album_track a ON a.track = v.track "
+      "WHERE a.album IS NOT NULL AND v.cue_sheet_path" +
+      below +
+      " UNION SELECT 1, t.path FROM virtual_info_track v JOIN track t ON t.id = v.track "
+      "WHERE v.cue_sheet_path" +
+      below);
+}
 
 bool ScanState::has_unsettled() {
   return database_.query("SELECT 1 AS one FROM scan.unsettled LIMIT 1").next();

@@ -106,6 +106,8 @@ class ScanState {
   void set_root(int id, const std::string& volume, bool away);
   /// Files in the index below a folder.
   std::int64_t count_files(const std::string& folder);
+  /// Whether the index holds a file or a folder below a folder.
+  bool holds_anything(const std::string& folder);
 
   /// Marks what the index no longer holds, and takes up what it holds without being known here.
   void reconcile(const std::string& folder);
@@ -148,6 +150,8 @@ class ScanState {
 
   /* Settling */
 
+  /// Notes what a delete of all at and below a folder may leave behind; before it is done.
+  void unsettle_below(const std::string& folder);
   bool has_unsettled();
   /// Albums that deletes may have left in another state than a fresh scan.
   std::vector<std::string> unsettled_albums();

@@ -13,6 +13,7 @@
 #include <algorithm>
 #include <cerrno>
 #include <chrono>
+#include <cstdlib>
 #include <cstring>
 #include <deque>
 #include <filesystem>
@@ -427,7 +428,7 @@ FileState Scanner::state_of(const Ready& ready) const {
   const auto& before = answer.before;
   out.status.size = before.size;
   out.status.modified = before.seconds * 1'000'000'000 + before.nanoseconds;
-  const bool is_settled = before == answer.after && now() - out.status.modified > kTick;
+  const bool is_settled = before == answer.after && std::abs(now() - out.status.modified) > kTick;
   if (!is_settled) out.status.size = -2;
   return out;
 }

@@ -113,7 +113,7 @@ bool Scanner::is_away(const Start& start, bool must_hold_something) {
 }
 
 void Scanner::plan_start(Start& start) {
-  const bool has_rows = state_.count_files(start.root) > 0;
+  const bool has_rows = state_.holds_anything(start.root);
   if (is_away(start, has_rows)) {
     report_.is_away = true;
     report_.offline += static_cast<std::size_t>(state_.count_files(start.root));

@@ -3,6 +3,7 @@
 #include "database.h"
 
 #include <libpq-fe.h>
+#include <signal.h>
 #include <unistd.h>
 
 #include <cstdlib>
@@ -157,6 +158,11 @@ TestServer::~TestServer() {
 const fs::path& TestServer::socket_folder() const { return parts_->server.socket_folder(); }
 void TestServer::start() { parts_->server.start(kSettings); }
 void TestServer::stop() { parts_->server.stop(); }
+
+void TestServer::crash() {
+  if (const auto server = parts_->server.running()) kill(*server, SIGQUIT);
+  stop();
+}
 
 void TestServer::fresh_database() {
   const Connection admin(socket_folder(), "postgres");

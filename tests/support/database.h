@@ -31,6 +31,9 @@ class TestServer {
   /// Throws std::runtime_error with the server's message.
   std::vector<Row> rows(const std::string& sql);
   void stop();
+  /// Ends it at once, as a loss of power does to it: sessions and what they did not commit are
+  /// gone.
+  void crash();
   void start();
 
  private:

@@ -9,6 +9,7 @@
 #include <exiv2/exiv2.hpp>
 
 #include "tags/av_input.h"
+#include "tags/music_format.h"
 
 namespace mediidx::tool {
 namespace {
@@ -33,6 +34,7 @@ std::vector<RawTag> container_tags(const std::string& path) {
 
 std::vector<RawTag> music_tags(const std::string& path) {
   TagLib::FileStream stream(path.c_str(), /*openReadOnly=*/true);
+  if (is_matroska(stream)) return container_tags(path);
   const TagLib::FileRef opened(&stream);
   if (opened.isNull()) return container_tags(path);
   std::vector<RawTag> out;

@@ -14,7 +14,8 @@ extern "C" {
 #include <limits>
 #include <string_view>
 
-#include "tags/media_file.h"
+#include "tags/file_times.h"
+#include "text/legacy_text.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -41,7 +42,18 @@ std::string extension_of(const std::string& path) {
 
 std::string find_tag(const AVDictionary* tags, const char* name) {
   const auto* entry = av_dict_get(tags, name, nullptr, 0);
-  return entry ? clean_text(entry->value) : std::string();
+  return entry ? clean_text(decode_legacy(entry->value)) : std::string();
+}
+
+bool is_cover(const AVStream* stream) {
+  return (stream->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
+}
+
+void take(const AVDictionary* tags, NamedTags& out) {
+  const AVDictionaryEntry* entry = nullptr;
+  while ((entry = av_dict_get(tags, "", entry, AV_DICT_IGNORE_SUFFIX))) {
+    out.add(entry->key, decode_legacy(entry->value));
+  }
 }
 
 }  // namespace
@@ -63,18 +75,33 @@ AvInput::AvInput(const std::string& path) {
 
 AvInput::~AvInput() { avformat_close_input(&context_); }
 
-const AVStream* AvInput::stream(AVMediaType type) const {
+const AVStream* AvInput::best_stream(AVMediaType type) const {
   const int index = av_find_best_stream(context_, type, -1, -1, nullptr, 0);
   if (index < 0) return nullptr;
   const auto* found = context_->streams[index];
-  const bool is_cover = (found->disposition & AV_DISPOSITION_ATTACHED_PIC) != 0;
-  return is_cover ? nullptr : found;
+  return is_cover(found) ? first_stream(type) : found;
+}
+
+const AVStream* AvInput::first_stream(AVMediaType type) const {
+  for (unsigned i = 0; i < context_->nb_streams; ++i) {
+    const auto* found = context_->streams[i];
+    if (found->codecpar->codec_type == type && !is_cover(found)) return found;
+  }
+  return nullptr;
 }
 
 std::string AvInput::tag(const char* name) const {
   auto text = find_tag(context_->metadata, name);
-  const auto* audio = text.empty() ? stream(AVMEDIA_TYPE_AUDIO) : nullptr;
+  const auto* audio = text.empty() ? first_stream(AVMEDIA_TYPE_AUDIO) : nullptr;
   return audio ? find_tag(audio->metadata, name) : text;
+}
+
+NamedTags AvInput::tags() const {
+  NamedTags out{TagFamily::kOther, {}};
+  take(context_->metadata, out);
+  if (const auto* audio = first_stream(AVMEDIA_TYPE_AUDIO)) take(audio->metadata, out);
+  for (unsigned i = 0; i < context_->nb_streams; ++i) out.covers += is_cover(context_->streams[i]);
+  return out;
 }
 
 double AvInput::duration_s() const {
@@ -99,6 +126,13 @@ int to_int(std::int64_t value) {
 
 std::string codec_of(const AVStream* stream) {
   return stream ? avcodec_get_name(stream->codecpar->codec_id) : "";
+}
+
+int bit_rate_of(const AVStream* stream) {
+  if (!stream) return 0;
+  if (stream->codecpar->bit_rate > 0) return to_int(stream->codecpar->bit_rate);
+  const auto* entry = av_dict_get(stream->metadata, "BPS", nullptr, 0);
+  return entry ? leading_number(entry->value) : 0;
 }
 
 }  // namespace mediidx::tool

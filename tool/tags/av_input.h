@@ -9,7 +9,10 @@ extern "C" {
 #include <libavformat/avformat.h>
 }
 
+#include <cstdint>
 #include <string>
+
+#include "tags/tag_table.h"
 
 namespace mediidx::tool {
 
@@ -24,10 +27,14 @@ class AvInput {
   AvInput& operator=(const AvInput&) = delete;
 
   /// The stream that a player would choose; null when there is none. Covers are no video.
-  const AVStream* stream(AVMediaType type) const;
+  const AVStream* best_stream(AVMediaType type) const;
+  /// The first one of this type; null when there is none.
+  const AVStream* first_stream(AVMediaType type) const;
   /// A tag of the file, else of the audio stream (where Ogg has them), cleaned; empty when there is
   /// none. Names match without regard to case.
   std::string tag(const char* name) const;
+  /// All tags of the file and of its first audio stream, and the number of covers.
+  NamedTags tags() const;
   double duration_s() const;
   /// Bits a second of all streams; 0 when unknown.
   int bit_rate() const;
@@ -43,6 +50,9 @@ class AvInput {
 int to_int(std::int64_t value);
 /// "h264", "aac"; empty without a stream.
 std::string codec_of(const AVStream* stream);
+/// The rate that the stream's header tells, or the one that Matroska's writers leave as a tag; 0
+/// without a stream.
+int bit_rate_of(const AVStream* stream);
 
 }  // namespace mediidx::tool
 

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: MIT
 #include "tags/file_times.h"
 
+#include <algorithm>
 #include <array>
 #include <charconv>
 #include <chrono>
@@ -71,8 +72,9 @@ std::string camera_time(std::string_view text) {
 
 int year_of(std::string_view date) {
   const int year = take_number(date, 4, "");
-  const bool ends = date.empty() || date[0] < '0' || date[0] > '9';
-  return year > 0 && ends ? year : 0;
+  const auto digits = std::min(date.find_first_not_of("0123456789"), date.size());
+  constexpr std::size_t kMonthAndDay = 4;
+  return year > 0 && (digits == 0 || digits == kMonthAndDay) ? year : 0;
 }
 
 int leading_number(std::string_view text) {

@@ -26,7 +26,7 @@ FileTimes file_times(const struct statx& status);
 /// when it is none, zeros and impossible dates among them.
 std::string camera_time(std::string_view text);
 
-/// The year that begins a date ("2004-05-01", "2004"); 0 when there is none.
+/// The year that begins a date ("2004-05-01", "2004-05", "2004", "20040501"); 0 when there is none.
 int year_of(std::string_view date);
 
 /// The number that begins "3/12" or "3"; 0 when there is none or it does not fit.

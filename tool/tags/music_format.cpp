@@ -4,10 +4,8 @@
 
 #include <aifffile.h>
 #include <apefile.h>
-#include <apetag.h>
 #include <asffile.h>
 #include <flacfile.h>
-#include <id3v2tag.h>
 #include <mp4file.h>
 #include <mpcfile.h>
 #include <mpegfile.h>
@@ -19,58 +17,77 @@
 #include <wavfile.h>
 #include <wavpackfile.h>
 
+#include <cmath>
+#include <string_view>
+
+#include "tags/dsf_file.h"
+#include "tags/musepack_gain.h"
+#include "tags/named_tags.h"
+
 namespace mediidx::tool {
 namespace {
 
-std::string upper_text(const TagLib::String& text) { return text.upper().to8Bit(true); }
+namespace Ogg = TagLib::Ogg;
+namespace RIFF = TagLib::RIFF;
 
-int count_covers(const TagLib::ID3v2::Tag* tag) {
-  return tag ? static_cast<int>(tag->frameList("APIC").size()) : 0;
+template <class Tag>
+void append(Tag* tag, MusicFormat& out) {
+  if (!tag) return;
+  out.tags.push_back(named_tags(*tag));
+  out.covers += out.tags.back().covers;
 }
 
-int count_covers(const TagLib::APE::Tag* tag) {
-  int covers = 0;
-  if (!tag) return covers;
-  for (const auto& item : tag->itemListMap()) {
-    covers += upper_text(item.first).starts_with("COVER ART") ? 1 : 0;
+/// The file's tag of one family. Files with one tag only have it under the plain name.
+template <class File>
+void append(TagFamily family, File& file, MusicFormat& out) {
+  if constexpr (!requires { file.ID3v2Tag(); } && requires { named_tags(*file.tag()); }) {
+    append(file.tag(), out);
   }
-  return covers;
+  if constexpr (requires { file.ID3v2Tag(); }) {
+    if (family == TagFamily::kId3v2) append(file.ID3v2Tag(), out);
+  }
+  if constexpr (requires { file.ID3v1Tag(); }) {
+    if (family == TagFamily::kId3v1) append(file.ID3v1Tag(), out);
+  }
+  if constexpr (requires { file.APETag(); }) {
+    if (family == TagFamily::kApe) append(file.APETag(), out);
+  }
+  if constexpr (requires { file.xiphComment(); }) {
+    if (family == TagFamily::kVorbis) append(file.xiphComment(), out);
+  }
+  if constexpr (requires { file.InfoTag(); }) {
+    if (family == TagFamily::kRiffInfo) append(file.InfoTag(), out);
+  }
 }
 
-int count_covers(TagLib::Ogg::XiphComment* tag) {
-  return tag ? static_cast<int>(tag->pictureList().size()) : 0;
+/// The codec where the file itself does not have to be asked.
+template <class File>
+std::string codec_of(const File& /*file*/, std::string_view usual) {
+  return std::string(usual);
 }
 
-MusicFormat describe(TagLib::MPEG::File& file) {
+std::string codec_of(const TagLib::MPEG::File& file, std::string_view usual) {
   static constexpr const char* kLayers[] = {"", "mp1", "mp2", "mp3"};
   const auto* properties = file.audioProperties();
   const int layer = properties ? properties->layer() : 0;
-  const char* codec = layer >= 1 && layer <= 3 ? kLayers[layer] : "mp3";
-  return {codec, codec, count_covers(file.ID3v2Tag()) + count_covers(file.APETag()), {}};
+  return layer >= 1 && layer <= 3 ? kLayers[layer] : std::string(usual);
 }
 
-MusicFormat describe(TagLib::FLAC::File& file) {
-  return {"flac", "flac", static_cast<int>(file.pictureList().size()), {}};
-}
-
-MusicFormat describe(TagLib::MP4::File& file) {
-  MusicFormat out{"aac", "mp4", 0, {}};
+std::string codec_of(const TagLib::MP4::File& file, std::string_view usual) {
   const auto* properties = file.audioProperties();
-  if (properties && properties->codec() == TagLib::MP4::Properties::ALAC) out.codec = "alac";
-  if (properties && properties->codec() == TagLib::MP4::Properties::Unknown) out.codec.clear();
-  const std::string own_name = "----:COM.APPLE.ITUNES:";
-  for (const auto& item : file.tag()->itemMap()) {
-    const auto name = upper_text(item.first);
-    if (name == "COVR") out.covers = static_cast<int>(item.second.toCoverArtList().size());
-    const auto texts = item.second.toStringList();
-    if (name.starts_with(own_name) && !texts.isEmpty()) {
-      out.extra_tags[name.substr(own_name.size())] = texts.front().to8Bit(true);
-    }
+  if (!properties) return std::string(usual);
+  switch (properties->codec()) {
+    case TagLib::MP4::Properties::ALAC:
+      return "alac";
+    case TagLib::MP4::Properties::Unknown:
+      return {};
+    default:
+      return std::string(usual);
   }
-  return out;
 }
 
-std::string asf_codec(const TagLib::ASF::Properties* properties) {
+std::string codec_of(const TagLib::ASF::File& file, std::string_view usual) {
+  const auto* properties = file.audioProperties();
   switch (properties ? properties->codec() : TagLib::ASF::Properties::Unknown) {
     case TagLib::ASF::Properties::WMA1:
       return "wmav1";
@@ -81,71 +98,106 @@ std::string asf_codec(const TagLib::ASF::Properties* properties) {
     case TagLib::ASF::Properties::WMA9Lossless:
       return "wmalossless";
     default:
-      return {};
+      return std::string(usual);
   }
-}
-
-MusicFormat describe(TagLib::ASF::File& file) {
-  MusicFormat out{asf_codec(file.audioProperties()), "asf", 0, {}};
-  for (const auto& item : file.tag()->attributeListMap()) {
-    const auto name = upper_text(item.first);
-    if (name == "WM/PICTURE") out.covers = static_cast<int>(item.second.size());
-    if (!item.second.isEmpty()) {
-      out.extra_tags[name] = item.second.front().toString().to8Bit(true);
-    }
-  }
-  return out;
 }
 
 /// The format tag of a RIFF file: 1 and 3 are plain samples; 0xFFFE names them further on.
-MusicFormat describe(TagLib::RIFF::WAV::File& file) {
+std::string codec_of(const RIFF::WAV::File& file, std::string_view usual) {
   constexpr int kSamples = 1;
   constexpr int kFloatSamples = 3;
   const auto* properties = file.audioProperties();
   const int format = properties ? properties->format() : 0;
-  const bool is_pcm = format == kSamples || format == kFloatSamples;
-  return {is_pcm ? "pcm" : "", "wav", count_covers(file.ID3v2Tag()), {}};
+  return format == kSamples || format == kFloatSamples ? std::string(usual) : "";
 }
 
-MusicFormat describe(TagLib::RIFF::AIFF::File& file) {
-  return {"pcm", "aiff", count_covers(file.tag()), {}};
+template <class File>
+void add_own(File& /*file*/, MusicFormat& /*out*/) {}
+
+void add_own(TagLib::MPEG::File& /*file*/, MusicFormat& out) { out.container = out.codec; }
+
+/// Pictures stand beside the comments here.
+void add_own(TagLib::FLAC::File& file, MusicFormat& out) {
+  out.covers += static_cast<int>(file.pictureList().size());
+}
+
+MusepackGain musepack_gain(TagLib::MPC::File& file) {
+  constexpr unsigned kBeginning = 4096;
+  file.seek(0);
+  const auto bytes = file.readBlock(kBeginning);
+  if (const auto gain = parse_musepack_gain({bytes.data(), bytes.size()})) return *gain;
+  const auto* older = file.audioProperties();
+  if (!older) return {};
+  return {older->trackGain(), older->trackPeak(), older->albumGain(), older->albumPeak()};
+}
+
+/// The gains of the stream's header.
+void add_own(TagLib::MPC::File& file, MusicFormat& out) {
+  NamedTags header{TagFamily::kApe, {}};
+  const auto add_gain = [&header](const char* name, int gain) {
+    constexpr double kReference = 64.82;
+    if (gain != 0) header.add(name, std::to_string(kReference - gain / 256.0));
+  };
+  const auto add_peak = [&header](const char* name, int peak) {
+    constexpr double kFullScale = 32768;
+    if (peak != 0) header.add(name, std::to_string(std::pow(10, peak / 256.0 / 20) / kFullScale));
+  };
+  const auto gain = musepack_gain(file);
+  add_gain("(Musepack header) track gain", gain.track_gain);
+  add_peak("(Musepack header) track peak", gain.track_peak);
+  add_gain("(Musepack header) album gain", gain.album_gain);
+  add_peak("(Musepack header) album peak", gain.album_peak);
+  out.tags.push_back(std::move(header));
+}
+
+struct Names {
+  const char* codec;
+  const char* container;
+};
+
+/// Describes the file and returns true when it is of this class.
+template <class File>
+bool describe(TagLib::File* any, MusicFormatId id, Names names, MusicFormat& out) {
+  auto* file = dynamic_cast<File*>(any);
+  if (!file) return false;
+  out.codec = codec_of(*file, names.codec);
+  out.container = names.container;
+  for (const auto family : music_formats()[static_cast<std::size_t>(id)].families) {
+    append(family, *file, out);
+  }
+  add_own(*file, out);
+  return true;
 }
 
 }  // namespace
 
+bool is_matroska(TagLib::IOStream& stream) {
+  const TagLib::ByteVector mark("\x1A\x45\xDF\xA3", 4);
+  stream.seek(0);
+  const bool found = stream.readBlock(mark.size()) == mark;
+  stream.seek(0);
+  return found;
+}
+
 MusicFormat music_format(TagLib::File* file) {
-  namespace Ogg = TagLib::Ogg;
-  if (auto* mpeg = dynamic_cast<TagLib::MPEG::File*>(file)) return describe(*mpeg);
-  if (auto* flac = dynamic_cast<TagLib::FLAC::File*>(file)) return describe(*flac);
-  if (auto* mp4 = dynamic_cast<TagLib::MP4::File*>(file)) return describe(*mp4);
-  if (auto* asf = dynamic_cast<TagLib::ASF::File*>(file)) return describe(*asf);
-  if (auto* wav = dynamic_cast<TagLib::RIFF::WAV::File*>(file)) return describe(*wav);
-  if (auto* aiff = dynamic_cast<TagLib::RIFF::AIFF::File*>(file)) return describe(*aiff);
-  if (auto* vorbis = dynamic_cast<Ogg::Vorbis::File*>(file)) {
-    return {"vorbis", "ogg", count_covers(vorbis->tag()), {}};
-  }
-  if (auto* opus = dynamic_cast<Ogg::Opus::File*>(file)) {
-    return {"opus", "ogg", count_covers(opus->tag()), {}};
-  }
-  if (auto* flac = dynamic_cast<Ogg::FLAC::File*>(file)) {
-    return {"flac", "ogg", count_covers(flac->tag()), {}};
-  }
-  if (auto* speex = dynamic_cast<Ogg::Speex::File*>(file)) {
-    return {"speex", "ogg", count_covers(speex->tag()), {}};
-  }
-  if (auto* ape = dynamic_cast<TagLib::APE::File*>(file)) {
-    return {"ape", "ape", count_covers(ape->APETag()), {}};
-  }
-  if (auto* wavpack = dynamic_cast<TagLib::WavPack::File*>(file)) {
-    return {"wavpack", "wv", count_covers(wavpack->APETag()), {}};
-  }
-  if (auto* musepack = dynamic_cast<TagLib::MPC::File*>(file)) {
-    return {"musepack", "mpc", count_covers(musepack->APETag()), {}};
-  }
-  if (auto* tta = dynamic_cast<TagLib::TrueAudio::File*>(file)) {
-    return {"tta", "tta", count_covers(tta->ID3v2Tag()), {}};
-  }
-  return {};
+  using enum MusicFormatId;
+  MusicFormat out;
+  static_cast<void>(describe<TagLib::MPEG::File>(file, kMpeg, {"mp3", "mp3"}, out) ||
+                    describe<TagLib::FLAC::File>(file, kFlac, {"flac", "flac"}, out) ||
+                    describe<TagLib::MP4::File>(file, kMp4, {"aac", "mp4"}, out) ||
+                    describe<TagLib::ASF::File>(file, kAsf, {"", "asf"}, out) ||
+                    describe<RIFF::WAV::File>(file, kWav, {"pcm", "wav"}, out) ||
+                    describe<RIFF::AIFF::File>(file, kAiff, {"pcm", "aiff"}, out) ||
+                    describe<Ogg::Vorbis::File>(file, kVorbis, {"vorbis", "ogg"}, out) ||
+                    describe<Ogg::Opus::File>(file, kOpus, {"opus", "ogg"}, out) ||
+                    describe<Ogg::FLAC::File>(file, kOggFlac, {"flac", "ogg"}, out) ||
+                    describe<Ogg::Speex::File>(file, kSpeex, {"speex", "ogg"}, out) ||
+                    describe<TagLib::APE::File>(file, kMonkey, {"ape", "ape"}, out) ||
+                    describe<TagLib::WavPack::File>(file, kWavPack, {"wavpack", "wv"}, out) ||
+                    describe<TagLib::MPC::File>(file, kMusepack, {"musepack", "mpc"}, out) ||
+                    describe<TagLib::TrueAudio::File>(file, kTrueAudio, {"tta", "tta"}, out) ||
+                    describe<DsfFile>(file, kDsf, {"", "dsf"}, out));
+  return out;
 }
 
 }  // namespace mediidx::tool

@@ -11,6 +11,8 @@
 #include "tags/av_input.h"
 #include "tags/file_times.h"
 #include "tags/readers.h"
+#include "tags/tag_table.h"
+#include "text/legacy_text.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -27,62 +29,138 @@ void prepare_once() {
   static_cast<void>(done);
 }
 
-const Exiv2::Exifdatum* find(const Exiv2::ExifData& data, const char* key) {
-  const auto found = data.findKey(Exiv2::ExifKey(key));
-  return found == data.end() || found->count() == 0 ? nullptr : &*found;
+/// A datum of any kind that Exiv2 names; null when there is none.
+const Exiv2::Metadatum* find(const Exiv2::Image& image, const std::string& key) {
+  const auto find_in = [](const auto& data, const auto& name) -> const Exiv2::Metadatum* {
+    const auto found = data.findKey(name);
+    return found == data.end() || found->count() == 0 ? nullptr : &*found;
+  };
+  return key.starts_with("Xmp.") ? find_in(image.xmpData(), Exiv2::XmpKey(key))
+                                 : find_in(image.exifData(), Exiv2::ExifKey(key));
 }
 
-std::string text_of(const Exiv2::ExifData& data, const char* key) {
-  const auto* datum = find(data, key);
-  return datum ? clean_text(datum->toString()) : std::string();
+std::string text_of(const Exiv2::Metadatum& datum) {
+  const auto* titles = dynamic_cast<const Exiv2::LangAltValue*>(&datum.value());
+  return clean_text(decode_legacy(titles ? titles->toString("x-default") : datum.toString()));
 }
 
-double number_of(const Exiv2::ExifData& data, const char* key) {
-  const auto* datum = find(data, key);
-  if (!datum) return 0;
-  const auto [numerator, denominator] = datum->toRational();
+double number_of(const Exiv2::Metadatum& datum) {
+  const auto [numerator, denominator] = datum.toRational();
   return denominator == 0 ? 0 : static_cast<double>(numerator) / denominator;
 }
 
-/// Apertures and shutter speeds that are only given as powers of two.
-double f_number(const Exiv2::ExifData& data) {
-  const double plain = number_of(data, "Exif.Photo.FNumber");
-  const double apex = plain > 0 ? 0 : number_of(data, "Exif.Photo.ApertureValue");
-  return apex > 0 ? std::exp2(apex / 2) : plain;
+std::string time_of(const Exiv2::Metadatum& datum) { return camera_time(text_of(datum)); }
+
+/// Apertures and shutter speeds are sometimes only given as powers of two.
+bool is_power(const Exiv2::Metadatum& datum) { return datum.key().ends_with("Value"); }
+
+std::string aperture_of(const Exiv2::Metadatum& datum) {
+  const double number = number_of(datum);
+  return aperture_text(is_power(datum) && number > 0 ? std::exp2(number / 2) : number);
 }
 
-double exposure_s(const Exiv2::ExifData& data) {
-  const double plain = number_of(data, "Exif.Photo.ExposureTime");
-  if (plain > 0 || !find(data, "Exif.Photo.ShutterSpeedValue")) return plain;
-  return std::exp2(-number_of(data, "Exif.Photo.ShutterSpeedValue"));
+std::string exposure_of(const Exiv2::Metadatum& datum) {
+  const double number = number_of(datum);
+  return exposure_text(is_power(datum) ? std::exp2(-number) : number);
 }
 
-int iso_of(const Exiv2::ExifData& data) {
-  const auto found = Exiv2::isoSpeed(data);
-  return found == data.end() || found->count() == 0 ? 0 : to_int(found->toLong());
+void store_iso(const Exiv2::Image& image, MediaFile& file) {
+  const auto& exif = image.exifData();
+  const auto found = Exiv2::isoSpeed(exif);
+  if (found != exif.end() && found->count() > 0) file.iso = to_int(found->toLong());
 }
 
-std::string time_taken(const Exiv2::ExifData& data) {
-  for (const char* key : {"Exif.Photo.DateTimeOriginal", "Exif.Photo.DateTimeDigitized"}) {
-    const auto time = camera_time(text_of(data, key));
-    if (!time.empty()) return time;
+/// The size that the tags tell, where the image does not.
+int size_of(const Exiv2::Image& image, int pixels, const char* key) {
+  const auto* datum = pixels > 0 ? nullptr : find(image, key);
+  return datum ? to_int(std::lround(number_of(*datum))) : pixels;
+}
+
+/// Turned as the picture is to be shown.
+void store_size(const Exiv2::Image& image, MediaFile& file) {
+  constexpr double kFirstTurned = 5;
+  constexpr double kLastTurned = 8;
+  file.resolution_x = size_of(image, to_int(image.pixelWidth()), "Exif.Photo.PixelXDimension");
+  file.resolution_y = size_of(image, to_int(image.pixelHeight()), "Exif.Photo.PixelYDimension");
+  for (const char* key : {"Exif.Image.Orientation", "Xmp.tiff.Orientation"}) {
+    const auto* datum = find(image, key);
+    if (!datum) continue;
+    const double orientation = number_of(*datum);
+    if (orientation >= kFirstTurned && orientation <= kLastTurned) {
+      std::swap(file.resolution_x, file.resolution_y);
+    }
+    return;
   }
-  return {};
 }
 
-std::string title_of(const Exiv2::XmpData& data) {
-  const auto found = data.findKey(Exiv2::XmpKey("Xmp.dc.title"));
-  if (found == data.end()) return {};
-  const auto* titles = dynamic_cast<const Exiv2::LangAltValue*>(&found->value());
-  return titles ? clean_text(titles->toString("x-default")) : std::string();
-}
+struct PhotoColumn {
+  ColumnText text;  ///< The source is the keys in the order in which they are looked for.
+  std::string MediaFile::* field;
+  std::string (*read)(const Exiv2::Metadatum& datum);
+  void (*store)(const Exiv2::Image& image, MediaFile& file);  ///< Of the others.
+};
 
-void read_size(const Exiv2::Image& image, MediaFile& out) {
-  out.resolution_x = to_int(image.pixelWidth());
-  out.resolution_y = to_int(image.pixelHeight());
-  if (out.resolution_x > 0 && out.resolution_y > 0) return;
-  out.resolution_x = to_int(std::lround(number_of(image.exifData(), "Exif.Photo.PixelXDimension")));
-  out.resolution_y = to_int(std::lround(number_of(image.exifData(), "Exif.Photo.PixelYDimension")));
+constexpr PhotoColumn kPhotoColumns[] = {
+    {{"title", "Xmp.dc.title", "for want of it the file's name without its extension"},
+     &MediaFile::title,
+     text_of,
+     nullptr},
+    {{"camera_make", "Exif.Image.Make, Xmp.tiff.Make", "as it stands"},
+     &MediaFile::camera_make,
+     text_of,
+     nullptr},
+    {{"camera_model", "Exif.Image.Model, Exif.Image.UniqueCameraModel, Xmp.tiff.Model",
+      "as it stands"},
+     &MediaFile::camera_model,
+     text_of,
+     nullptr},
+    {{"exposure",
+      "Exif.Photo.ExposureTime, Exif.Image.ExposureTime, Exif.Photo.ShutterSpeedValue, "
+      "Xmp.exif.ExposureTime",
+      "seconds: \"1/125\", from 0.3 on \"0.5\", \"2.5\""},
+     &MediaFile::exposure,
+     exposure_of,
+     nullptr},
+    {{"aperture",
+      "Exif.Photo.FNumber, Exif.Image.FNumber, Exif.Photo.ApertureValue, Xmp.exif.FNumber",
+      "\"f/2.8\", \"f/8\""},
+     &MediaFile::aperture,
+     aperture_of,
+     nullptr},
+    {{"timetaken",
+      "Exif.Photo.DateTimeOriginal, Exif.Image.DateTimeOriginal, Exif.Photo.DateTimeDigitized, "
+      "Xmp.exif.DateTimeOriginal, Xmp.photoshop.DateCreated, Xmp.xmp.CreateDate",
+      "the camera's own time: a zone is left out; impossible dates are none"},
+     &MediaFile::timetaken,
+     time_of,
+     nullptr},
+    {{"iso", "Exif.Photo.ISOSpeedRatings and what stands for it, makers' notes included",
+      "a number"},
+     nullptr,
+     nullptr,
+     store_iso},
+    {{"resolutionx",
+      "the image, Exif.Photo.PixelXDimension; Exif.Image.Orientation, Xmp.tiff.Orientation",
+      "pixels as the picture is shown: turned by a quarter, width and height change places"},
+     nullptr,
+     nullptr,
+     store_size},
+    {{"resolutiony",
+      "the image, Exif.Photo.PixelYDimension; Exif.Image.Orientation, Xmp.tiff.Orientation",
+      "likewise"},
+     nullptr,
+     nullptr,
+     nullptr},
+};
+
+/// The first of the keys that gives a text.
+std::string first_text(const Exiv2::Image& image, const PhotoColumn& column) {
+  std::string out;
+  for_each_name(column.text.source, [&](std::string_view key) {
+    const auto* datum = out.empty() ? find(image, std::string(key)) : nullptr;
+    if (datum) out = column.read(*datum);
+  });
+  return out;
 }
 
 Exiv2::Image::AutoPtr open_image(const std::string& path) {
@@ -122,18 +200,19 @@ std::string aperture_text(double f_number) {
   return "f/" + decimal(std::round(f_number * 10) / 10);
 }
 
+std::vector<ColumnText> photo_columns() {
+  std::vector<ColumnText> out;
+  for (const auto& column : kPhotoColumns) out.push_back(column.text);
+  return out;
+}
+
 void read_photo(MediaFile& file) {
   prepare_once();
   const auto image = open_image(file.path);
-  const auto& exif = image->exifData();
-  file.title = title_of(image->xmpData());
-  file.camera_make = text_of(exif, "Exif.Image.Make");
-  file.camera_model = text_of(exif, "Exif.Image.Model");
-  file.exposure = exposure_text(exposure_s(exif));
-  file.aperture = aperture_text(f_number(exif));
-  file.iso = iso_of(exif);
-  file.timetaken = time_taken(exif);
-  read_size(*image, file);
+  for (const auto& column : kPhotoColumns) {
+    if (column.field) file.*column.field = first_text(*image, column);
+    if (column.store) column.store(*image, file);
+  }
 }
 
 }  // namespace mediidx::tool

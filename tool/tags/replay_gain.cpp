@@ -22,19 +22,6 @@ std::optional<double> leading_decimal(std::string_view text) {
   return value;
 }
 
-template <class Parse>
-std::optional<double> find(const std::map<std::string, std::string>& tags, const char* name,
-                           Parse parse) {
-  const auto found = tags.find(name);
-  return found == tags.end() ? std::nullopt : parse(found->second);
-}
-
-std::optional<double> gain_of(const std::map<std::string, std::string>& tags, const char* name,
-                              const char* r128_name) {
-  const auto gain = find(tags, name, parse_gain);
-  return gain ? gain : find(tags, r128_name, parse_r128_gain);
-}
-
 }  // namespace
 
 std::optional<double> parse_gain(std::string_view text) {
@@ -51,13 +38,6 @@ std::optional<double> parse_r128_gain(std::string_view text) {
   const auto value = leading_decimal(text);
   if (!value || std::abs(*value / kR128Unit) > kLargestGain) return std::nullopt;
   return *value / kR128Unit + kR128ToReplayGain;
-}
-
-ReplayGain replay_gain_of(const std::map<std::string, std::string>& tags) {
-  return {gain_of(tags, "REPLAYGAIN_TRACK_GAIN", "R128_TRACK_GAIN"),
-          find(tags, "REPLAYGAIN_TRACK_PEAK", parse_peak),
-          gain_of(tags, "REPLAYGAIN_ALBUM_GAIN", "R128_ALBUM_GAIN"),
-          find(tags, "REPLAYGAIN_ALBUM_PEAK", parse_peak)};
 }
 
 }  // namespace mediidx::tool

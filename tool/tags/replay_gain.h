@@ -5,12 +5,8 @@
 #ifndef MEDIIDX_TOOL_TAGS_REPLAY_GAIN_H_
 #define MEDIIDX_TOOL_TAGS_REPLAY_GAIN_H_
 
-#include <map>
 #include <optional>
-#include <string>
 #include <string_view>
-
-#include "tags/media_file.h"
 
 namespace mediidx::tool {
 
@@ -20,9 +16,6 @@ std::optional<double> parse_gain(std::string_view text);
 std::optional<double> parse_peak(std::string_view text);
 /// Opus writes whole 1/256 dB against -23 LUFS; replay gain is 5 dB louder.
 std::optional<double> parse_r128_gain(std::string_view text);
-
-/// The gains among tags named in upper case. Replay gain's own tags come before those of Opus.
-ReplayGain replay_gain_of(const std::map<std::string, std::string>& tags);
 
 }  // namespace mediidx::tool
 

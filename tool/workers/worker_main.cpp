@@ -17,13 +17,14 @@
 #include <optional>
 #include <string_view>
 
+#include "text/legacy_text.h"
 #include "workers/messages.h"
 #include "workers/sandbox.h"
 
 namespace mediidx::tool {
 namespace {
 
-constexpr std::size_t kWords = 3;
+constexpr std::size_t kWords = 4;
 
 /// Empty when the file could not be looked at, with errno set.
 std::optional<struct statx> look_at(const std::string& path) {
@@ -136,6 +137,8 @@ bool is_tag_worker(const std::vector<std::string>& words) {
 
 void run_tag_worker(const std::vector<std::string>& words) {
   try {
+    set_code_page(words[3]);
+    decode_legacy("\xE9");  // What it takes is loaded while nothing is refused yet.
     limit_process(number_of<std::uint64_t>(words[1]));
     std::string hello;
     put_text(hello, enter_sandbox());

@@ -9,6 +9,7 @@
 #include <string.h>
 #include <sys/socket.h>
 #include <sys/wait.h>
+#include <tavoindex.h>
 #include <unistd.h>
 
 #include <array>
@@ -81,8 +82,9 @@ WorkerProcess::WorkerProcess(const std::string& program, const WorkerLimits& lim
   std::string word = kWorkerWord;
   auto memory = std::to_string(limits.memory_bytes);
   auto seconds = std::to_string(limits.processor_time.count());
-  const std::array<char*, 5> words{name.data(), word.data(), memory.data(), seconds.data(),
-                                   nullptr};
+  std::string page = TAVOIndexCodePageGet();
+  const std::array<char*, 6> words{name.data(),    word.data(), memory.data(),
+                                   seconds.data(), page.data(), nullptr};
   const int error = posix_spawn(&pid_, program.c_str(), Descriptors(ends[1]).get(),
                                 Attributes().get(), words.data(), environ);
   close(ends[1]);

@@ -62,7 +62,9 @@ INSTANTIATE_TEST_SUITE_P(
 TEST(Year, BeginsADate) {
   EXPECT_EQ(year_of("2004-05-01"), 2004);
   EXPECT_EQ(year_of("2004"), 2004);
-  EXPECT_EQ(year_of("20040501"), 0);
+  EXPECT_EQ(year_of("2004-05"), 2004);
+  EXPECT_EQ(year_of("20040501"), 2004);
+  EXPECT_EQ(year_of("200405"), 0);
   EXPECT_EQ(year_of("May 2004"), 0);
   EXPECT_EQ(year_of("0000"), 0);
   EXPECT_EQ(year_of("99"), 0);

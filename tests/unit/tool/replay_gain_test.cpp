@@ -4,6 +4,8 @@
 
 #include <gtest/gtest.h>
 
+#include "tags/tag_table.h"
+
 namespace mediidx::tool {
 namespace {
 
@@ -31,19 +33,26 @@ TEST(OpusGain, IsIn256thsAndFiveDecibelsQuieter) {
 }
 
 TEST(ReplayGain, IsTakenFromItsOwnTagsFirst) {
-  const auto gain = replay_gain_of({{"REPLAYGAIN_TRACK_GAIN", "-2 dB"},
-                                    {"R128_TRACK_GAIN", "0"},
-                                    {"R128_ALBUM_GAIN", "-1280"},
-                                    {"REPLAYGAIN_TRACK_PEAK", "0.5"}});
-  EXPECT_EQ(gain.track_gain, -2);
-  EXPECT_EQ(gain.track_peak, 0.5);
-  EXPECT_EQ(gain.album_gain, 0);
-  EXPECT_EQ(gain.album_peak, std::nullopt);
+  NamedTags tags{TagFamily::kVorbis, {}};
+  tags.add("REPLAYGAIN_TRACK_GAIN", "-2 dB");
+  tags.add("R128_TRACK_GAIN", "0");
+  tags.add("R128_ALBUM_GAIN", "-1280");
+  tags.add("REPLAYGAIN_TRACK_PEAK", "0.5");
+  MediaFile file;
+  store_tags({tags}, file);
+  EXPECT_EQ(file.gain.track_gain, -2);
+  EXPECT_EQ(file.gain.track_peak, 0.5);
+  EXPECT_EQ(file.gain.album_gain, 0);
+  EXPECT_EQ(file.gain.album_peak, std::nullopt);
 }
 
 TEST(ReplayGain, ThatCannotBeReadLeavesTheOtherTag) {
-  const auto gain = replay_gain_of({{"REPLAYGAIN_TRACK_GAIN", "?"}, {"R128_TRACK_GAIN", "0"}});
-  EXPECT_EQ(gain.track_gain, 5);
+  NamedTags tags{TagFamily::kVorbis, {}};
+  tags.add("replaygain_track_gain", "?");
+  tags.add("r128_track_gain", "0");
+  MediaFile file;
+  store_tags({tags}, file);
+  EXPECT_EQ(file.gain.track_gain, 5);
 }
 
 }  // namespace

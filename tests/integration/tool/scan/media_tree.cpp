@@ -251,11 +251,13 @@ std::string MediaTree::add_playlist() {
 }
 
 std::string MediaTree::add_cue_sheet() {
-  const auto folder = any_folder();
-  if (folder.empty() || is_closed(folder + "/" + kSheet)) return "";
-  const auto song = dice_.one_of(kFileNames) + std::string(dice_.one_of(kSongs).extension);
+  fs::path song = any_file();
+  if (!is_song(song)) return "";
+  const auto folder = song.parent_path().string();
+  if (is_closed(folder + "/" + kSheet)) return "";
+  if (dice_.chance(20)) song.replace_filename(std::string(dice_.one_of(kFileNames)) + ".mp3");
   std::string text = "PERFORMER \"" + std::string(dice_.one_of(kArtists)) + "\"\nTITLE \"" +
-                     dice_.one_of(kAlbums) + "\"\nFILE \"" + song + "\" WAVE\n";
+                     dice_.one_of(kAlbums) + "\"\nFILE \"" + song.filename().string() + "\" WAVE\n";
   const auto tracks = 1 + dice_.below(3);
   for (std::size_t i = 1; i <= tracks; ++i) {
     text += "  TRACK 0" + std::to_string(i) + " AUDIO\n    TITLE \"Part " + std::to_string(i) +
@@ -263,7 +265,7 @@ std::string MediaTree::add_cue_sheet() {
             "\"\n    INDEX 01 00:00:" + std::to_string(10 + 20 * i) + "\n";
   }
   write_file(folder + "/" + kSheet, text);
-  return "add " + folder + "/" + kSheet + " of " + song;
+  return "add " + folder + "/" + kSheet + " of " + song.filename().string();
 }
 
 std::string MediaTree::add_folder() {
@@ -279,7 +281,8 @@ std::string MediaTree::add_folder() {
 }
 
 std::string MediaTree::add_damaged() {
-  const auto file = new_file({".mp3", ".jpg", ".mkv"});
+  const auto old = any_file();
+  const auto file = is_song(old) ? old : new_file({".mp3", ".jpg", ".mkv"});
   if (file.empty()) return "";
   write_file(file, std::string(300 + dice_.below(300), 'x'));
   return "damage " + file;

@@ -185,7 +185,7 @@ class ALibrary : public DatabaseTest {
             {5, of_tree(&MediaTree::add_playlist)},
             {6, of_tree(&MediaTree::add_cue_sheet)},
             {8, of_tree(&MediaTree::add_folder)},
-            {2, of_tree(&MediaTree::add_damaged)},
+            {3, of_tree(&MediaTree::add_damaged)},
             {14, of_tree(&MediaTree::retag)},
             {4, of_tree(&MediaTree::replace)},
             {4, of_tree(&MediaTree::touch)},
@@ -212,7 +212,7 @@ class ALibrary : public DatabaseTest {
   std::vector<Step> steps_of_scans() {
     return {{50, [this] { return scan({}); }},
             {6, [this] { return scan({"--full"}); }},
-            {8, [this] { return scan_one_folder(); }},
+            {12, [this] { return scan_one_folder(); }},
             {5, [this] { return rehearse(); }},
             {14, [this] { return interrupt(SIGKILL, 128 + SIGKILL); }},
             {4, [this] { return interrupt(SIGINT, 130); }},
@@ -262,11 +262,22 @@ class ALibrary : public DatabaseTest {
         away.empty() ? std::set{kDone, kFileErrors} : std::set{kDone, kFileErrors, kVolumeAway});
   }
 
+  /// A scan of one folder, which may be a root that is away: it is nothing to other roots.
   std::string scan_one_folder() {
-    const auto folder = tree_->any_folder();
+    std::vector<std::string> away = tree_->roots();
+    std::erase_if(away, [this](const auto& one) { return !tree_->is_away(one); });
+    const auto folder =
+        away.empty() || dice_->chance(30) ? tree_->any_folder() : dice_->one_of(away);
     if (folder.empty()) return "";
-    return ended("scan " + folder, run("d", scan_words({folder})),
-                 {kDone, kFileErrors, kVolumeAway});
+    std::map<std::string, bool> others;
+    for (const auto& other : tree_->roots()) {
+      if (folder != other && !folder.starts_with(other + "/")) others[other] = any_online(other);
+    }
+    const auto done = run("d", scan_words({folder}));
+    for (const auto& [other, was_online] : others) {
+      EXPECT_EQ(any_online(other), was_online) << other << " after a scan of " << folder;
+    }
+    return ended("scan " + folder, done, {kDone, kFileErrors, kVolumeAway});
   }
 
   std::string rehearse() {

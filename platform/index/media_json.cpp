@@ -10,6 +10,7 @@
 #include <cstring>
 #include <span>
 #include <string>
+#include <utility>
 
 #include "json_field.h"
 
@@ -114,6 +115,32 @@ bool fill_path(const Json::Value& path, Record& record) {
          copy_whole(std::span(record.path).first(MEDIIDX_PATH_SIZE), text);
 }
 
+template <class T>
+T load(const char* place) {
+  T value;
+  std::memcpy(&value, place, sizeof value);
+  return value;
+}
+
+std::string text_at(const char* place, std::size_t size) { return {place, strnlen(place, size)}; }
+
+Json::Value field_value(const Field& field, const Record& record) {
+  const char* place = reinterpret_cast<const char*>(&record) + field.offset;
+  switch (field.kind) {
+    case Kind::kText:
+      return text_at(place, field.size);
+    case Kind::kInt32:
+      return load<std::int32_t>(place);
+    case Kind::kUInt32:
+      return load<std::uint32_t>(place);
+    case Kind::kInt64:
+      return Json::Int64{load<std::int64_t>(place)};
+    case Kind::kFloat:
+      return load<float>(place);
+  }
+  return {};
+}
+
 }  // namespace
 
 }  // namespace mediidx::platform
@@ -129,6 +156,20 @@ int MediaInfoJson2Object(const Json::Value& json, __tag_TAVO_MEDIA_INFO* info) {
     for (const auto& field : platform::kFields) {
       platform::fill_field(field, json[field.name], *info);
     }
+    return 0;
+  });
+}
+
+int MediaInfoObject2Json(const __tag_TAVO_MEDIA_INFO* info, Json::Value* json) {
+  namespace platform = mediidx::platform;
+  if (!info || !json) return platform::failed(-1, TAVO_ERR_BAD_PARAMETERS, "media_json.cpp", 4);
+  return platform::no_throw(-1, "media_json.cpp", 5, [&] {
+    Json::Value out(Json::objectValue);
+    out["szPath"] = platform::text_at(info->path, MEDIIDX_PATH_SIZE);
+    for (const auto& field : platform::kFields) {
+      out[field.name] = platform::field_value(field, *info);
+    }
+    *json = std::move(out);
     return 0;
   });
 }

@@ -43,6 +43,12 @@ TAVOINDEX_EXPORT const char* TAVOIndexCodePageGet(void);
 /// range.
 TAVOINDEX_EXPORT int MediaInfoJson2Object(const Json::Value& json,
                                           struct __tag_TAVO_MEDIA_INFO* info);
+
+/// The reverse: `json` becomes an object with every field of the record, from which
+/// MediaInfoJson2Object makes the same record where its path is not empty and its duration finite.
+/// Texts keep bytes that are no UTF-8. 0, or -1 when one of the two is null.
+TAVOINDEX_EXPORT int MediaInfoObject2Json(const struct __tag_TAVO_MEDIA_INFO* info,
+                                          Json::Value* json);
 #endif
 
 #endif

@@ -5,6 +5,7 @@
 #include <mediidx/record.h>
 #include <tavoindex.h>
 
+#include <array>
 #include <cmath>
 #include <cstring>
 #include <limits>
@@ -264,6 +265,105 @@ TEST_F(ARecordFromJson, NeedsAnObjectAndARecord) {
        {Json::Value(), Json::Value("text"), Json::Value(1), Json::Value(Json::arrayValue)}) {
     EXPECT_EQ(MediaInfoJson2Object(value, record_.get()), -1);
   }
+}
+
+/// Sets every field to one of its extremes. A field that is added to the record stops it from
+/// compiling.
+class EveryField : public testing::TestWithParam<std::size_t> {
+ protected:
+  template <class Number>
+  using Extremes = std::array<Number, 5>;
+
+  static void set(std::int32_t& field) {
+    field = Extremes<std::int32_t>{kLow, kHigh, -1, 1, 0}[GetParam()];
+  }
+  static void set(std::uint32_t& field) {
+    field = Extremes<std::uint32_t>{kUnsigned, 1U << 31U, 1, 2, 0}[GetParam()];
+  }
+  static void set(std::int64_t& field) {
+    field = Extremes<std::int64_t>{kLowest, kHighest, -1, (1LL << 53) + 1, 0}[GetParam()];
+  }
+  static void set(float& field) {
+    using Limits = std::numeric_limits<float>;
+    field =
+        Extremes<float>{Limits::max(), Limits::lowest(), Limits::denorm_min(), 0.1F, 0}[GetParam()];
+  }
+  template <std::size_t kSize>
+  static void set(char (&field)[kSize]) {
+    constexpr bool kIsPath = kSize == MEDIIDX_PATH_AREA_SIZE;
+    constexpr std::size_t kLongest = (kIsPath ? std::size_t{MEDIIDX_PATH_SIZE} : kSize) - 1;
+    std::string characters;
+    for (std::size_t i = 0; i < kLongest / 2; ++i) characters += "\u00E9";
+    const auto text =
+        Extremes<std::string>{std::string(kLongest, 'x'), characters, " \n\t\"\\/\x01\x7F ",
+                              "\xFF\xC3", kIsPath ? "/" : ""}[GetParam()];
+    std::memcpy(field, text.c_str(), text.size() + 1);
+  }
+
+  static std::unique_ptr<Record> record() {
+    auto out = std::make_unique<Record>();
+    auto& [id, path, track, disc, year, title, album, artist, album_artist, genre, composer,
+           comment, camera_make, camera_model, exposure, aperture, timetaken, date, mdate, duration,
+           bitrate, frame_bitrate, video_bitrate, frame_rate_num, frame_rate_den, frequency,
+           channel, resolution_x, resolution_y, filesize, reserved, covercount, iso, video_codec,
+           container_type, video_profile, video_level, audio_codec, fs_uuid] = *out;
+    const auto set_all = [](auto&... fields) { (set(fields), ...); };
+    set_all(id, path, track, disc, year, title, album, artist, album_artist, genre, composer,
+            comment, camera_make, camera_model, exposure, aperture, timetaken, date, mdate,
+            duration, bitrate, frame_bitrate, video_bitrate, frame_rate_num, frame_rate_den,
+            frequency, channel, resolution_x, resolution_y, filesize, covercount, iso, video_codec,
+            container_type, video_profile, video_level, audio_codec, fs_uuid);
+    return out;
+  }
+};
+
+TEST_P(EveryField, ComesBackFromJson) {
+  const auto before = record();
+  Json::Value json;
+  ASSERT_EQ(MediaInfoObject2Json(before.get(), &json), 0);
+  EXPECT_EQ(json.size(), 38U);
+  const auto after = std::make_unique<Record>();
+  ASSERT_EQ(MediaInfoJson2Object(json, after.get()), 0);
+  EXPECT_EQ(std::memcmp(before.get(), after.get(), sizeof(Record)), 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(Extremes, EveryField, testing::Values(0, 1, 2, 3, 4));
+
+/// But for texts that are no UTF-8, which JSON cannot be written with.
+class EveryWrittenField : public EveryField {};
+
+TEST_P(EveryWrittenField, ComesBackFromTheTextOfItsJson) {
+  const auto before = record();
+  Json::Value json;
+  ASSERT_EQ(MediaInfoObject2Json(before.get(), &json), 0);
+  std::istringstream text(json.toStyledString());
+  Json::Value read;
+  text >> read;
+  const auto after = std::make_unique<Record>();
+  ASSERT_EQ(MediaInfoJson2Object(read, after.get()), 0);
+  EXPECT_EQ(std::memcmp(before.get(), after.get(), sizeof(Record)), 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(Extremes, EveryWrittenField, testing::Values(0, 1, 2, 4));
+
+TEST(JsonFromARecord, HasTextsThatFillTheirFieldsWithoutAnEnd) {
+  const auto record = std::make_unique<Record>();
+  std::memset(record->aperture, 'a', sizeof(record->aperture));
+  std::memset(record->path, 'p', sizeof(record->path));
+  Json::Value json;
+  ASSERT_EQ(MediaInfoObject2Json(record.get(), &json), 0);
+  EXPECT_EQ(json["aperture"], std::string(sizeof(record->aperture), 'a'));
+  EXPECT_EQ(json["szPath"], std::string(MEDIIDX_PATH_SIZE, 'p'));
+}
+
+TEST(JsonFromARecord, ReplacesWhatWasThere) {
+  const auto record = std::make_unique<Record>();
+  Json::Value json;
+  json["other"] = 1;
+  ASSERT_EQ(MediaInfoObject2Json(record.get(), &json), 0);
+  EXPECT_FALSE(json.isMember("other"));
+  EXPECT_EQ(MediaInfoObject2Json(nullptr, &json), -1);
+  EXPECT_EQ(MediaInfoObject2Json(record.get(), nullptr), -1);
 }
 
 }  // namespace

@@ -20,7 +20,7 @@
 #include <cmath>
 #include <string_view>
 
-#include "tags/dsf_file.h"
+#include "tags/id3_file.h"
 #include "tags/musepack_gain.h"
 #include "tags/named_tags.h"
 
@@ -196,7 +196,7 @@ MusicFormat music_format(TagLib::File* file) {
                     describe<TagLib::WavPack::File>(file, kWavPack, {"wavpack", "wv"}, out) ||
                     describe<TagLib::MPC::File>(file, kMusepack, {"musepack", "mpc"}, out) ||
                     describe<TagLib::TrueAudio::File>(file, kTrueAudio, {"tta", "tta"}, out) ||
-                    describe<DsfFile>(file, kDsf, {"", "dsf"}, out));
+                    describe<Id3File>(file, kOtherId3, {"", ""}, out));
   return out;
 }
 

@@ -3,7 +3,7 @@
 #include <tfilestream.h>
 
 #include "tags/av_input.h"
-#include "tags/dsf_file.h"
+#include "tags/id3_file.h"
 #include "tags/music_format.h"
 #include "tags/readers.h"
 #include "tags/tag_table.h"
@@ -11,11 +11,11 @@
 namespace mediidx::tool {
 namespace {
 
-/// What libavformat reads of a DSF's tag is a part of it.
-bool read_dsf_tag(MediaFile& file) {
+/// What libavformat reads of ID3v2 is a part of it. False when there is none.
+bool read_id3(MediaFile& file) {
   TagLib::FileStream stream(file.path.c_str(), /*openReadOnly=*/true);
-  DsfFile dsf(&stream);
-  const auto format = music_format(&dsf);
+  Id3File id3(&stream);
+  const auto format = music_format(&id3);
   store_tags(format.tags, file);
   file.covercount = format.covers;
   return !format.tags.empty();
@@ -34,7 +34,7 @@ void read_other_music(MediaFile& file) {
   file.channel = to_int(audio->codecpar->ch_layout.nb_channels);
   file.video_codec = codec_of(audio);
   file.container_type = input.container(file.path);
-  if (file.container_type == "dsf" && read_dsf_tag(file)) return;
+  if (read_id3(file)) return;
   const auto tags = input.tags();
   store_tags({tags}, file);
   file.covercount = tags.covers;

@@ -83,7 +83,7 @@ const MusicColumn kMusicColumns[] = {
      kAll,
      all<&MediaFile::artist>,
      {"TPE1, TXXX:ARTISTS", "artist", "ARTIST, ARTISTS", "©ART, ----:ARTISTS", "Artist, Artists",
-      "Author, WM/ARTISTS", "IART", "artist"}},
+      "Author, WM/ARTISTS", "IART", "artist, author"}},
     {"album_artist",
      kAll,
      all<&MediaFile::album_artist>,
@@ -169,7 +169,7 @@ const MusicFormatTags kMusicFormats[] = {
     {"WavPack", {TagFamily::kApe, TagFamily::kId3v1}},
     {"Musepack", {TagFamily::kApe, TagFamily::kId3v1}},
     {"True Audio", {TagFamily::kId3v2, TagFamily::kId3v1}},
-    {"DSF", {TagFamily::kId3v2}},
+    {"DSF, AAC and others with ID3v2", {TagFamily::kId3v2}},
 };
 
 std::string upper(std::string_view text) {

@@ -72,7 +72,7 @@ enum class MusicFormatId {
   kWavPack,
   kMusepack,
   kTrueAudio,
-  kDsf,
+  kOtherId3,
 };
 struct MusicFormatTags {
   std::string_view name;

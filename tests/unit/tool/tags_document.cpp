@@ -24,9 +24,10 @@ constexpr SampledFormat kMusic[] = {
     {"WavPack", "wavpack, wvtag, mutagen", false},
     {"Musepack", "mpcenc, mpcgain, mutagen (version 8; version 7 never tried)", false},
     {"True Audio", "ffmpeg, mutagen", false},
-    {"DSF", "our own writer; mutagen", true},
+    {"DSF, AAC and others with ID3v2", "our own writer (DSF), ffmpeg (AAC); mutagen", true},
     {"Matroska audio", "ffmpeg", false},
-    {"AAC, AC-3, AMR, AU, CAF, DFF, DTS, RealAudio, TAK", "never tried", true},
+    {"AC-3, AU, DTS, RealAudio", "ffmpeg", false},
+    {"AMR, DFF, TAK", "never tried", true},
 };
 
 constexpr SampledFormat kPhotos[] = {

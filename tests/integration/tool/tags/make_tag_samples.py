@@ -67,11 +67,12 @@ def make_sounds():
            "-c:a", "pcm_s16le", "-fflags", "+bitexact", work / "a.wav")
     ffmpeg("-f", "lavfi", "-i", "color=c=teal:size=16x16:rate=1", "-frames:v", "1",
            work / "cover.jpg")
-    plain = ["-map_metadata", "-1", "-fflags", "+bitexact"]
+    plain = ["-map_metadata", "-1", "-fflags", "+bitexact", "-strict", "experimental"]
     outputs = []
     for name, codec in (("a.mp3", "libmp3lame"), ("a.m4a", "aac"), ("alac.m4a", "alac"),
                         ("a.wma", "wmav2"), ("a.tta", "tta"), ("a.aiff", "pcm_s16be"),
-                        ("a.mka", "flac")):
+                        ("a.mka", "flac"), ("a.aac", "aac"), ("a.mp2", "mp2"), ("a.ac3", "ac3"),
+                        ("a.dts", "dca")):
         outputs += [*plain, "-c:a", codec, work / name]
     ffmpeg("-i", work / "a.wav", *outputs)
     ffmpeg("-i", work / "a.wav", *plain, "-ar", "16000", "-ac", "1", "-c:a", "libspeex",
@@ -197,7 +198,7 @@ def tagged_in_full():
     for name in GAINS:
         del fields[name]
     add_xiph(copy("a.opus", "full.opus"), mutagen.oggopus.OggOpus, fields)
-    for name in ("a.mp3", "a.tta"):
+    for name in ("a.mp3", "a.mp2", "a.tta", "a.aac"):
         id3_only(copy(name, "full" + name[1:]), id3_frames(), v1=0)
     add_id3(copy("a.wav", "full.wav"), mutagen.wave.WAVE, id3_frames())
     add_id3(copy("a.aiff", "full.aiff"), mutagen.aiff.AIFF, id3_frames())
@@ -332,6 +333,12 @@ def odd_ones():
     shutil.copy(out / "full.opus", out / "output-gain.opus")
     set_output_gain(out / "output-gain.opus", 512)
     copy("a.dsf", "untagged.dsf")
+    copy("a.ac3", "untagged.ac3")
+    copy("a.dts", "untagged.dts")
+    named = ["-metadata", "title=Slack Water", "-metadata", "artist=Ada Brandt"]
+    ffmpeg("-i", work / "a.wav", *named, "-metadata", "album=Low Tide", out / "some.au")
+    ffmpeg("-i", work / "a.wav", *named, "-metadata", "author=Ada Brandt", "-ar", "8000", "-ac", "1", "-c:a", "real_144",
+           out / "some.ra")
     for name, value in (("day", "2004-05-01"), ("month", "2004-05"), ("year", "2004"),
                         ("compact", "20040501"), ("time", "2004-05-01T12:00:00"), ("words", "May")):
         add_xiph(copy("a.flac", f"dates/{name}.flac"), mutagen.flac.FLAC, {"DATE": [value]})

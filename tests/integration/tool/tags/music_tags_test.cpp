@@ -41,6 +41,8 @@ Fields full(const std::string& codec, const std::string& container, const Fields
 }
 
 TEST(AllTags, OfAnMp3AreRead) { EXPECT_EQ(fields_of("full.mp3"), full("mp3", "mp3")); }
+TEST(AllTags, OfAnMp2AreRead) { EXPECT_EQ(fields_of("full.mp2"), full("mp2", "mp2")); }
+TEST(AllTags, OfAnAacAreRead) { EXPECT_EQ(fields_of("full.aac"), full("aac", "aac")); }
 TEST(AllTags, OfAFlacAreRead) { EXPECT_EQ(fields_of("full.flac"), full("flac", "flac")); }
 TEST(AllTags, OfAnOggVorbisAreRead) { EXPECT_EQ(fields_of("full.ogg"), full("vorbis", "ogg")); }
 TEST(AllTags, OfAnOggFlacAreRead) { EXPECT_EQ(fields_of("full.oga"), full("flac", "ogg")); }
@@ -151,6 +153,32 @@ TEST(ADsf, WithoutATagIsNamedAfterItsFile) {
                                                {"channel", "2"},
                                                {"video_codec", "dsd_lsbf_planar"},
                                                {"container_type", "dsf"}}));
+}
+
+TEST(AFormatWithoutTags, IsNamedAfterItsFile) {
+  for (const std::string name : {"ac3", "dts"}) {
+    EXPECT_EQ(fields_of("untagged." + name), (Fields{{"title", "untagged"},
+                                                     {"duration", "1"},
+                                                     {"bitrate", "some"},
+                                                     {"frequency", "44100"},
+                                                     {"channel", "2"},
+                                                     {"video_codec", name},
+                                                     {"container_type", name}}));
+  }
+}
+
+TEST(AFormatWithFewTags, HasThoseRead) {
+  const Fields names{{"title", "Slack Water"}, {"artist", "Ada Brandt"}, {"bitrate", "some"}};
+  EXPECT_EQ(fields_of("some.au"), with(names, {{"album", "Low Tide"},
+                                               {"duration", "1"},
+                                               {"frequency", "44100"},
+                                               {"channel", "2"},
+                                               {"video_codec", "pcm_s16be"},
+                                               {"container_type", "au"}}));
+  EXPECT_EQ(fields_of("some.ra"), with(names, {{"frequency", "8000"},
+                                               {"channel", "1"},
+                                               {"video_codec", "ra_144"},
+                                               {"container_type", "rm"}}));
 }
 
 TEST(ReplayGainOfId3, StandsInAVolumeFrameToo) {

@@ -1,9 +1,9 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-/// DSF, of which TagLib reads the tag but does not know where it stands.
-#ifndef MEDIIDX_TOOL_TAGS_DSF_FILE_H_
-#define MEDIIDX_TOOL_TAGS_DSF_FILE_H_
+/// ID3v2 in files of formats that TagLib does not know: at their beginning, or where DSF says.
+#ifndef MEDIIDX_TOOL_TAGS_ID3_FILE_H_
+#define MEDIIDX_TOOL_TAGS_ID3_FILE_H_
 
 #include <id3v2tag.h>
 #include <tfile.h>
@@ -12,10 +12,10 @@
 
 namespace mediidx::tool {
 
-class DsfFile : public TagLib::File {
+class Id3File : public TagLib::File {
  public:
   /// The stream outlives the object.
-  explicit DsfFile(TagLib::IOStream* stream);
+  explicit Id3File(TagLib::IOStream* stream);
   /// Null when there is none.
   TagLib::ID3v2::Tag* ID3v2Tag() const { return tag_.get(); }
 

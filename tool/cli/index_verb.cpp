@@ -53,7 +53,8 @@ int run_index(const Arguments& arguments) {
   for (const auto& named : arguments.operands) folders.push_back(real_folder(named));
   const DataFolder data(arguments.value("--data-dir"));
   reload_on_hangup();
-  const PidFile pid_file(data, PidFile::IfTaken::kThrow);
+  const ScanLock lock(data, ScanLock::IfTaken::kThrow);
+  const PidFile pid_file(data);
   Database database(data);
   make_known(data, folders);
   ScanSetting setting;

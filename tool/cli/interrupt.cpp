@@ -11,12 +11,14 @@ namespace {
 
 volatile sig_atomic_t first_signal = 0;
 volatile sig_atomic_t hangup = 0;
+volatile sig_atomic_t user_signal = 0;
 
 void note(int number) {
   if (first_signal == 0) first_signal = number;
 }
 
 void note_hangup(int) { hangup = 1; }
+void note_question(int) { user_signal = 1; }
 
 }  // namespace
 
@@ -31,6 +33,8 @@ void note_signals() {
     sigaction(number, &action, nullptr);
   }
   signal(SIGPIPE, SIG_IGN);
+  // Somebody wants to write a file on which there was a lease for a moment.
+  signal(SIGIO, SIG_IGN);
 }
 
 int noted_signal() { return first_signal; }
@@ -40,6 +44,19 @@ void reload_on_hangup() {
   action.sa_handler = note_hangup;
   action.sa_flags = SA_RESTART;
   sigaction(SIGHUP, &action, nullptr);
+}
+
+void answer_user_signal() {
+  struct sigaction action{};
+  action.sa_handler = note_question;
+  action.sa_flags = SA_RESTART;
+  sigaction(SIGUSR1, &action, nullptr);
+}
+
+bool take_user_signal() {
+  if (user_signal == 0) return false;
+  user_signal = 0;
+  return true;
 }
 
 bool take_hangup() {

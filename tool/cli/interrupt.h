@@ -21,6 +21,12 @@ void reload_on_hangup();
 /// True when such a signal came since the last call.
 bool take_hangup();
 
+/// From now on SIGUSR1 asks how far things are.
+void answer_user_signal();
+
+/// True when such a signal came since the last call.
+bool take_user_signal();
+
 }  // namespace mediidx::tool
 
 #endif

@@ -140,6 +140,12 @@ void Progress::step(const std::string& path) {
   ++state_.done;
 }
 
+void Progress::answer() {
+  state_.seconds = std::chrono::duration<double>(Clock::now() - begin_).count();
+  clear();
+  std::fprintf(stderr, "mediidx: %s\n", progress_words(state_).c_str());
+}
+
 void Progress::tell(const std::string& path) {
   if (as_json_) {
     std::fprintf(stderr, "%s\n", progress_json(state_, path).c_str());

@@ -51,6 +51,8 @@ class Progress {
   void start(std::size_t total);
   /// Counts one more, at work on this path.
   void step(const std::string& path);
+  /// Tells now, whatever there is to be told.
+  void answer();
   /// Makes room for a message.
   void clear();
 

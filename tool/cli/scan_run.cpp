@@ -45,7 +45,8 @@ ScanReport run_scanner(const DataFolder& data, Database& database,
   Progress progress(setting.json_progress ? Progress::Style::kJson : Progress::Style::kForPeople);
   ScanHooks hooks;
   hooks.must_stop = [] { return noted_signal() != 0; };
-  hooks.reload = [] {
+  hooks.reload = [&progress] {
+    if (take_user_signal()) progress.answer();
     if (!take_hangup()) return false;
     IndexFolderUpdate();
     return true;

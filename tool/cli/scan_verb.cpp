@@ -56,7 +56,8 @@ int run_scan(const Arguments& arguments) {
   const auto setting = setting_of(arguments);
   const DataFolder data(arguments.value("--data-dir"));
   reload_on_hangup();
-  const PidFile pid_file(data, PidFile::IfTaken::kThrow);
+  const ScanLock lock(data, ScanLock::IfTaken::kThrow);
+  const PidFile pid_file(data);
   IndexFolderUpdate();
   std::vector<std::string> folders;
   for (const auto& named : arguments.operands) folders.push_back(folder_of(named));

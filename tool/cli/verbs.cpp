@@ -84,6 +84,13 @@ constexpr Option kScanOptions[] = {
     {"--json", nullptr, "print the last line as JSON"},
 };
 
+constexpr Option kWatchOptions[] = {
+    {"--interval", "SECONDS", "scan everything so often, whatever the kernel tells"},
+    {"--settle", "MILLISECONDS", "so long has a folder to be quiet before it is looked at (2000)"},
+    {"--most-folders", "N", "do not watch more folders than this"},
+    kFullSpeed,
+};
+
 int run_help(const Arguments& arguments) {
   std::string name;
   for (const auto& word : arguments.operands) name += (name.empty() ? "" : " ") + word;
@@ -121,6 +128,22 @@ const Verb kVerbs[] = {
      kScanOptions,
      {},
      run_scan},
+    {"watch",
+     "",
+     "scan, then follow what changes in the folders chosen for indexing",
+     0,
+     0,
+     kWatchOptions,
+     {},
+     run_watch},
+    {"status",
+     "",
+     "show when the folders were scanned, and the files that are left alone",
+     0,
+     0,
+     kJsonOption,
+     {},
+     run_status},
     {"list", "music|albums|artists|genres|photos|videos|playlists|folders",
      "show what is in the index", 1, 1, kListOptions, list_choices(), run_list},
     {"show", "PATH", "show all that the index holds of one path", 1, 1, kJsonOption, {}, run_show},

@@ -38,6 +38,8 @@ int run_guarded(const std::function<int()>& what);
 
 int run_index(const Arguments& arguments);
 int run_scan(const Arguments& arguments);
+int run_status(const Arguments& arguments);
+int run_watch(const Arguments& arguments);
 int run_list(const Arguments& arguments);
 int run_show(const Arguments& arguments);
 int run_search(const Arguments& arguments);

@@ -72,6 +72,8 @@ std::string reason_text(const IndexAnswer& answer) {
       return "it belongs to mediidx's own data";
     case Reason::kPassedOver:
       return "the name " + subject + " is passed over";
+    case Reason::kIgnored:
+      return "a .mediidxignore file leaves it out";
     case Reason::kUnreadable:
       return "it cannot be read: " + subject;
     case Reason::kNoFile:

@@ -16,6 +16,7 @@
 #include "indexfolder/entry.h"
 #include "mediidx/index_folder.h"
 #include "mediidx/request.h"
+#include "scan/coverage.h"
 #include "scan/file_walk.h"
 #include "store/query.h"
 #include "support/owned.h"
@@ -147,6 +148,12 @@ bool is_found_elsewhere(const std::string& real, MEDIA_TABLE_TYPE type) {
          TAVOMediaIndexIsIndexPath(real.c_str(), type) > 0;
 }
 
+bool is_ignored_by_scan(const IndexAnswer& answer) {
+  return std::ranges::any_of(outermost_index_folders(), [&answer](const auto& root) {
+    return is_ignored(root, answer.path, answer.is_folder);
+  });
+}
+
 /// What the scan knows beyond the library.
 void check_scan(IndexAnswer& out, const DataFolder& data, const std::string& base,
                 MEDIA_TABLE_TYPE type) {
@@ -156,6 +163,8 @@ void check_scan(IndexAnswer& out, const DataFolder& data, const std::string& bas
   } else if (const auto name = passed_over_name(out.path, base); !name.empty()) {
     out.reason = Reason::kPassedOver;
     out.subject = name;
+  } else if (is_ignored_by_scan(out)) {
+    out.reason = Reason::kIgnored;
   } else if (stat(out.path.c_str(), &status) != 0) {
     if (errno == ENOENT || errno == ENOTDIR) return;
     out.reason = Reason::kUnreadable;
@@ -185,10 +194,10 @@ bool is_unstorable(IndexAnswer& out) {
 
 const char* name_of(Reason reason) {
   static constexpr std::array kNames{
-      "index_folder",      "personal_library", "not_utf8",   "too_long",
-      "unknown_extension", "remote_mount",     "kind_off",   "share_gone",
-      "no_folders",        "outside",          "own_data",   "passed_over",
-      "unreadable",        "no_file",          "empty_file", "other_name",
+      "index_folder", "personal_library", "not_utf8",   "too_long",   "unknown_extension",
+      "remote_mount", "kind_off",         "share_gone", "no_folders", "outside",
+      "own_data",     "passed_over",      "ignored",    "unreadable", "no_file",
+      "empty_file",   "other_name",
   };
   static_assert(kNames.size() == static_cast<std::size_t>(Reason::kOtherName) + 1);
   return kNames.at(static_cast<std::size_t>(reason));

@@ -28,6 +28,7 @@ enum class Reason {
   kOutside,           ///< None of the folders chosen for indexing holds it.
   kOwnData,           ///< It is a part of mediidx's own data.
   kPassedOver,        ///< A name on the way is one that the scan passes over.
+  kIgnored,           ///< A ".mediidxignore" file leaves it out.
   kUnreadable,        ///< It cannot be looked at or read.
   kNoFile,            ///< It is a socket, a device or the like.
   kEmptyFile,         ///< It has no content.

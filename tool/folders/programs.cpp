@@ -106,7 +106,8 @@ int run_indexer(const std::string& program, const std::vector<std::string>& word
   if (folder.empty()) throw UsageError("/: the whole system is not indexed");
   const auto data = data_folder_of(program);
   reload_on_hangup();
-  const PidFile pid_file(data, PidFile::IfTaken::kWait);
+  const ScanLock lock(data, ScanLock::IfTaken::kWait);
+  const PidFile pid_file(data);
   IndexFolderUpdate();
   return words[0] == "-A" ? add_folder(data, folder) : drop_folder(data, folder);
 }

@@ -7,6 +7,7 @@
 
 #include <array>
 #include <string>
+#include <vector>
 
 #include "tags/media_file.h"
 
@@ -22,6 +23,12 @@ struct Coverage {
 };
 
 Coverage coverage_of(const std::string& folder);
+
+/// True for the folder itself too.
+bool is_below(const std::string& path, const std::string& folder);
+
+/// The index folders that lie in no other one: where a scan begins.
+std::vector<std::string> outermost_index_folders();
 
 }  // namespace mediidx::tool
 

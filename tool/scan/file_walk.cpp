@@ -111,6 +111,18 @@ std::string real_path(const std::string& path) {
   return real ? real.get() : "";
 }
 
+bool is_ignored(const std::string& root, const std::string& path, bool is_folder) {
+  IgnoreRules rules(root);
+  for (auto at = root.size(); at < path.size() && path.starts_with(root + "/");) {
+    const auto folder = path.substr(0, at);
+    const auto text = read_start(folder + "/" + kIgnoreFile);
+    if (!text.empty()) rules.add(folder, text);
+    at = std::min(path.find('/', at + 1), path.size());
+    if (rules.ignores(path.substr(0, at), at < path.size() || is_folder)) return true;
+  }
+  return false;
+}
+
 FileWalk::FileWalk(std::vector<std::string> roots, Visit visit, Skip skip)
     : roots_(std::move(roots)), visit_(std::move(visit)), skip_(std::move(skip)), rules_("/") {}
 
@@ -183,6 +195,7 @@ bool FileWalk::enter(const std::string& path, const struct stat& status, bool th
   folder.path = path;
   folder.status = FileStatus(status);
   folder.is_mounted = is_mount_point(path);
+  before_(path);
   Listing listing;
   folder.is_readable = listing.read(path);
   if (!folder.is_readable) {
@@ -197,6 +210,7 @@ bool FileWalk::enter(const std::string& path, const struct stat& status, bool th
   if (!visit_(folder)) return false;
   for (const auto& name : subfolders) {
     const auto subfolder = path + "/" + name;
+    if (!descend_(subfolder)) continue;
     struct stat entry{};
     const bool is_link = links.contains(name);
     if ((is_link ? stat : lstat)(subfolder.c_str(), &entry) != 0) continue;

@@ -62,6 +62,9 @@ bool is_passed_over(const std::string& name);
 /// be read, with errno set.
 bool is_empty_folder(const std::string& folder);
 
+/// True when the ignore files from the root on leave a path below it out.
+bool is_ignored(const std::string& root, const std::string& path, bool is_folder);
+
 /// A path, or nothing: through links, as realpath gives it.
 std::string real_path(const std::string& path);
 
@@ -76,11 +79,18 @@ class FileWalk {
   /// Told of paths that cannot be read or stored.
   using Skip = std::function<void(const Failure& failure)>;
 
+  /// Told of each folder before it is listed.
+  using Before = std::function<void(const std::string& folder)>;
+  /// Asked whether to walk a subfolder.
+  using Descend = std::function<bool(const std::string& folder)>;
+
   /// `roots` are real paths of folders that are walked now or at other times.
   FileWalk(std::vector<std::string> roots, Visit visit, Skip skip);
 
   /// Whatever is below this folder is passed over.
   void exclude(const std::string& folder);
+  void before_each(Before before) { before_ = std::move(before); }
+  void descend_where(Descend descend) { descend_ = std::move(descend); }
   /// Walks a folder that is one of the roots or lies in one; false when the walk was ended.
   bool walk(const std::string& root, const std::string& folder);
   /// True when what stands between root and folder leaves the folder out.
@@ -106,6 +116,8 @@ class FileWalk {
   std::vector<std::string> roots_;
   Visit visit_;
   Skip skip_;
+  Before before_ = [](const std::string&) {};
+  Descend descend_ = [](const std::string&) { return true; };
   std::set<Identity> excluded_;
   std::set<Identity> folders_;   ///< Entered on the way here or through a link.
   std::set<Identity> linked_;    ///< Files with several names or found through links.

@@ -55,6 +55,16 @@ FileStamp stamp_of(const std::string& path) {
   return {status.st_size, status.st_mtim.tv_sec, static_cast<std::int32_t>(status.st_mtim.tv_nsec)};
 }
 
+/// The kernel grants a lease on a file only when nobody has it open for writing. To other users'
+/// files it may not be asked about: those count as written.
+bool is_being_written(const std::string& path) {
+  const int descriptor = open(path.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK | O_NOCTTY);
+  if (descriptor < 0) return false;
+  const bool is_refused = fcntl(descriptor, F_SETLEASE, F_RDLCK) != 0 && errno == EAGAIN;
+  close(descriptor);
+  return is_refused;
+}
+
 /// Playlists and cue sheets have no tags: only the file system is asked.
 TagAnswer read_here(const Change& change) {
   TagAnswer answer;
@@ -160,8 +170,7 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
 
   if (options_.dry_run) database_.run("BEGIN");
   state_.begin();
-  starts_ = starts_for(folders);
-  plan();
+  plan(starts_for(folders));
   if (options_.dry_run) {
     count_plan();
     database_.run("ROLLBACK");
@@ -332,6 +341,7 @@ void Scanner::submit(Change change) {
     ++report_.switched_off;
     return;
   }
+  if (options_.pass_over_open && is_being_written(change.path)) return;
   if (change.kind == Kind::kPlaylist || change.kind == Kind::kCueSheet) {
     auto answer = read_here(change);
     return receive({std::move(change), std::move(answer)});

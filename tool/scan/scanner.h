@@ -33,6 +33,10 @@ struct ScanOptions {
   bool dry_run = false;            ///< Only count.
   bool allow_mass_delete = false;  ///< Remove however much is gone.
   bool accept_volumes = false;     ///< Take what is mounted now as right.
+  bool trust_index = false;        ///< Nobody else has changed the index since the last scan.
+  bool pass_over_open = false;     ///< Leave files for later that somebody is writing now.
+  FileWalk::Before before;         ///< Told of each folder before it is listed; may be empty.
+  FileWalk::Descend descend;       ///< Asked whether to walk a subfolder; may be empty.
 };
 
 /// What a scan did. Files are counted, not folders, but where it says so.
@@ -75,10 +79,15 @@ class Scanner {
   ScanReport run(const std::vector<std::string>& folders);
 
  private:
+  struct Root {
+    std::string path;
+    KnownRoot known;
+    bool has_rows = false;
+    bool is_away = false;
+  };
   struct Start {
     std::string root;
     std::string folder;
-    KnownRoot known;
   };
 
   void run_once(const std::vector<std::string>& folders);
@@ -88,16 +97,18 @@ class Scanner {
 
   // Looking.
   std::vector<Start> starts_for(const std::vector<std::string>& folders);
-  void plan();
-  void plan_start(Start& start);
-  void plan_missing(const Start& start);
-  bool is_away(const Start& start, bool must_hold_something);
+  void plan(const std::vector<Start>& starts);
+  void look_at_root(Root& root);
+  bool is_away(const Root& root);
+  void give_up(Root& root);
+  void plan_start(Root& root, const Start& start);
+  void plan_missing(const Root& root, const std::string& folder);
   void take_offline(const std::string& folder);
   void bring_online(const std::string& folder);
   bool has_offline_rows(const std::string& folder);
-  void plan_folders(const Start& start, std::vector<ListedFolder>& folders);
+  void plan_folders(const Root& root, std::vector<ListedFolder>& folders);
   bool is_unmounted(const ListedFolder& listed, const KnownFolder& known);
-  void check_removals(const Start& start);
+  void check_removals(const Root& root);
   void count_plan();
 
   // Doing.
@@ -139,7 +150,7 @@ class Scanner {
   ScanHooks hooks_;
   ScanState state_;
   ScanReport report_;
-  std::vector<Start> starts_;
+  std::map<std::string, Root> roots_;        ///< Of this scan, by path.
   std::vector<std::string> away_;            ///< Folders whose file systems are not mounted.
   std::map<std::uint64_t, Change> in_hand_;  ///< With the workers, by ticket.
   std::uint64_t last_ticket_ = 0;

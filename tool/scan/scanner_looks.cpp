@@ -5,12 +5,8 @@
 #include <sys/stat.h>
 
 #include <algorithm>
-#include <array>
-#include <cerrno>
-#include <cstring>
 
 #include "mediidx/database.h"
-#include "mediidx/index_folder.h"
 #include "scan/scanner.h"
 #include "store/query.h"
 #include "tags/volume_id.h"
@@ -26,30 +22,6 @@ constexpr std::size_t kFilesAtOnce = 20'000;
 constexpr std::int64_t kFewRemovals = 100;
 constexpr std::int64_t kTenth = 10;
 
-bool is_below(const std::string& path, const std::string& folder) {
-  return path == folder || path.starts_with(folder + "/");
-}
-
-/// The index folders that lie in no other one.
-std::vector<std::string> outermost_index_folders() {
-  std::vector<std::string> out;
-  std::array<char, MEDIIDX_PATH_SIZE> path;
-  for (int i = 0; i < IndexFolderSizeGet(); ++i) {
-    if (IndexFolderPathAt(static_cast<unsigned>(i), path.data(), static_cast<int>(path.size())) ==
-        1) {
-      out.emplace_back(path.data());
-    }
-  }
-  std::ranges::sort(out);
-  std::vector<std::string> roots;
-  for (auto& folder : out) {
-    const bool is_inner =
-        std::ranges::any_of(roots, [&folder](const auto& root) { return is_below(folder, root); });
-    if (!is_inner) roots.push_back(std::move(folder));
-  }
-  return roots;
-}
-
 }  // namespace
 
 std::vector<Scanner::Start> Scanner::starts_for(const std::vector<std::string>& folders) {
@@ -59,83 +31,110 @@ std::vector<Scanner::Start> Scanner::starts_for(const std::vector<std::string>& 
     const auto root = std::ranges::find_if(
         roots, [&folder](const auto& candidate) { return is_below(folder, candidate); });
     if (root != roots.end()) {
-      out.push_back({*root, folder, {}});
+      out.push_back({*root, folder});
       continue;
     }
     const auto before = out.size();
     for (const auto& inner : roots) {
-      if (is_below(inner, folder)) out.push_back({inner, inner, {}});
+      if (is_below(inner, folder)) out.push_back({inner, inner});
     }
     // A user's own library is indexed whatever the configuration says.
     const auto coverage = coverage_of(folder);
-    if (out.size() == before && coverage.wants(Kind::kMusic)) out.push_back({folder, folder, {}});
+    if (out.size() == before && coverage.wants(Kind::kMusic)) out.push_back({folder, folder});
   }
   if (folders.empty()) {
-    for (const auto& root : roots) out.push_back({root, root, {}});
+    for (const auto& root : roots) out.push_back({root, root});
   }
-  // Each place once, also where one start lies in another.
+  // Each place once: a start within another one is walked with that, unless it may not be.
   std::ranges::sort(out, {}, &Start::folder);
   std::vector<Start> starts;
   for (auto& start : out) {
-    const bool is_inner = std::ranges::any_of(
-        starts, [&start](const auto& other) { return is_below(start.folder, other.folder); });
+    const bool is_inner = std::ranges::any_of(starts, [&](const auto& other) {
+      return start.folder == other.folder ||
+             (!options_.descend && is_below(start.folder, other.folder));
+    });
     if (!is_inner) starts.push_back(std::move(start));
   }
   return starts;
 }
 
-void Scanner::plan() {
-  for (auto& start : starts_) {
+void Scanner::plan(const std::vector<Start>& starts) {
+  roots_.clear();
+  for (const auto& start : starts) {
     if (stops()) return;
-    start.known = state_.root(start.root);
-    plan_start(start);
+    auto [at, is_new] = roots_.try_emplace(start.root);
+    auto& root = at->second;
+    if (is_new) {
+      root.path = start.root;
+      look_at_root(root);
+    }
+    if (!root.is_away) plan_start(root, start);
+  }
+  // A file system that went away during the walk has looked like an empty one.
+  for (auto& [path, root] : roots_) {
+    if (root.is_away) continue;
+    if (is_away(root)) {
+      state_.withdraw(root.known.id);
+      give_up(root);
+    } else if (!options_.dry_run) {
+      bring_online(path);
+      state_.set_root(root.known.id, volume_id(path), false);
+    }
   }
   state_.add_files_of_lost_folders();
   state_.find_moves();
-  for (const auto& start : starts_) check_removals(start);
+  for (const auto& [path, root] : roots_) {
+    if (!root.is_away) check_removals(root);
+  }
   state_.find_consequences();
 }
 
-bool Scanner::is_away(const Start& start, bool must_hold_something) {
+void Scanner::look_at_root(Root& root) {
+  root.known = state_.root(root.path);
+  root.has_rows = state_.holds_anything(root.path);
+  if (is_away(root)) give_up(root);
+}
+
+bool Scanner::is_away(const Root& root) {
   struct stat status{};
   std::string why;
-  if (stat(start.root.c_str(), &status) != 0 || !S_ISDIR(status.st_mode)) {
+  if (stat(root.path.c_str(), &status) != 0 || !S_ISDIR(status.st_mode)) {
     why = "is not there";
-  } else if (must_hold_something && is_empty_folder(start.root)) {
+  } else if (root.has_rows && is_empty_folder(root.path)) {
     why = "is empty, but was not";
-  } else if (!options_.accept_volumes && !start.known.volume.empty() &&
-             volume_id(start.root) != start.known.volume) {
+  } else if (!options_.accept_volumes && !root.known.volume.empty() &&
+             volume_id(root.path) != root.known.volume) {
     why = "is on another file system than last time (if that is right: --accept-volumes)";
   }
   if (why.empty()) return false;
-  hooks_.say(escape_for_display(start.root) + " " + why + ": nothing of it is changed");
+  hooks_.say(escape_for_display(root.path) + " " + why + ": nothing of it is changed");
   return true;
 }
 
-void Scanner::plan_start(Start& start) {
-  const bool has_rows = state_.holds_anything(start.root);
-  if (is_away(start, has_rows)) {
-    report_.is_away = true;
-    report_.offline += static_cast<std::size_t>(state_.count_files(start.root));
-    if (options_.dry_run) return;
-    take_offline(start.root);
-    state_.set_root(start.known.id, start.known.volume, true);
-    return;
-  }
-  state_.reconcile(start.folder);
-  if (look_at(start.folder) == Presence::kGone) return plan_missing(start);
+void Scanner::give_up(Root& root) {
+  root.is_away = true;
+  report_.is_away = true;
+  report_.offline += static_cast<std::size_t>(state_.count_files(root.path));
+  if (options_.dry_run) return;
+  take_offline(root.path);
+  state_.set_root(root.known.id, root.known.volume, true);
+}
+
+void Scanner::plan_start(Root& root, const Start& start) {
+  if (!options_.trust_index) state_.reconcile(start.folder);
+  if (look_at(start.folder) == Presence::kGone) return plan_missing(root, start.folder);
 
   std::vector<ListedFolder> portion;
   std::size_t files_in_portion = 0;
   std::size_t files = 0;
   std::size_t folders = 0;
   const auto flush = [&] {
-    plan_folders(start, portion);
+    plan_folders(root, portion);
     portion.clear();
     files_in_portion = 0;
   };
   std::vector<std::string> roots;
-  for (const auto& root : outermost_index_folders()) roots.push_back(real_path(root));
+  for (const auto& other : outermost_index_folders()) roots.push_back(real_path(other));
   roots.push_back(real_path(start.folder));
   FileWalk walk(
       roots,
@@ -156,31 +155,19 @@ void Scanner::plan_start(Start& start) {
         hooks_.fail(failure);
       });
   walk.exclude(data_.path());
-  if (walk.is_left_out(start.root, start.folder)) return;
-  walk.walk(start.root, start.folder);
+  if (options_.before) walk.before_each(options_.before);
+  if (options_.descend) walk.descend_where(options_.descend);
+  walk.walk(root.path, start.folder);
   flush();
-  // A file system that went away during the walk has looked like an empty one.
-  if (is_away(start, has_rows)) {
-    state_.withdraw(start.known.id);
-    report_.is_away = true;
-    report_.offline += static_cast<std::size_t>(state_.count_files(start.root));
-    if (options_.dry_run) return;
-    take_offline(start.root);
-    state_.set_root(start.known.id, start.known.volume, true);
-    return;
-  }
-  if (options_.dry_run) return;
-  bring_online(start.root);
-  state_.set_root(start.known.id, volume_id(start.root), false);
 }
 
-void Scanner::plan_missing(const Start& start) {
+void Scanner::plan_missing(const Root& root, const std::string& folder) {
   Change lost;
   lost.what = What::kGoneFolder;
   lost.is_folder = true;
-  lost.root = start.known.id;
-  lost.path = start.folder;
-  const auto parent = start.folder.substr(0, start.folder.rfind('/'));
+  lost.root = root.known.id;
+  lost.path = folder;
+  const auto parent = folder.substr(0, folder.rfind('/'));
   if (look_at(parent) == Presence::kFolder) state_.add({&lost, 1});
 }
 
@@ -212,7 +199,7 @@ bool Scanner::is_unmounted(const ListedFolder& listed, const KnownFolder& known)
   return was_mounted && !listed.found.is_mounted && !options_.accept_volumes;
 }
 
-void Scanner::plan_folders(const Start& start, std::vector<ListedFolder>& folders) {
+void Scanner::plan_folders(const Root& root, std::vector<ListedFolder>& folders) {
   std::erase_if(folders, [this](const auto& listed) {
     return std::ranges::any_of(
         away_, [&listed](const auto& away) { return is_below(listed.found.path, away); });
@@ -220,7 +207,7 @@ void Scanner::plan_folders(const Start& start, std::vector<ListedFolder>& folder
   auto known = state_.look_up(folders);
   CompareOptions options;
   options.full = options_.full;
-  options.tolerance = time_tolerance(start.folder);
+  options.tolerance = time_tolerance(root.path);
   Comparison comparison;
   for (const auto& listed : folders) {
     const auto& path = listed.found.path;
@@ -228,7 +215,7 @@ void Scanner::plan_folders(const Start& start, std::vector<ListedFolder>& folder
     const bool is_away_too =
         std::ranges::any_of(away_, [&path](const auto& away) { return is_below(path, away); });
     if (is_away_too) continue;
-    if (path != start.root && is_unmounted(listed, before)) {
+    if (path != root.path && is_unmounted(listed, before)) {
       away_.push_back(path);
       report_.is_away = true;
       report_.offline += static_cast<std::size_t>(state_.count_files(path));
@@ -245,22 +232,22 @@ void Scanner::plan_folders(const Start& start, std::vector<ListedFolder>& folder
     }
     if (listed.found.is_readable) compare(listed, before, options, comparison);
   }
-  for (auto& change : comparison.changes) change.root = start.known.id;
+  for (auto& change : comparison.changes) change.root = root.known.id;
   state_.add(comparison.changes);
   report_.skipped += comparison.left_alone + comparison.switched_off;
   report_.switched_off += comparison.switched_off;
 }
 
-void Scanner::check_removals(const Start& start) {
-  const auto removal = state_.removal_of(start.known.id, start.root);
+void Scanner::check_removals(const Root& root) {
+  const auto removal = state_.removal_of(root.known.id, root.path);
   if (options_.allow_mass_delete || removal.removed <= kFewRemovals ||
       removal.removed * kTenth <= removal.known) {
     return;
   }
   report_.is_refused = true;
-  state_.withdraw_removals(start.known.id);
+  state_.withdraw_removals(root.known.id);
   hooks_.say("not removed: " + std::to_string(removal.removed) + " of " +
-             std::to_string(removal.known) + " files of " + escape_for_display(start.root) +
+             std::to_string(removal.known) + " files of " + escape_for_display(root.path) +
              ". If they are really gone: --allow-mass-delete");
 }
 

@@ -14,7 +14,8 @@ namespace mediidx::tool {
 /// The folder of a mediidx:
 ///   .mediidx    says that the folder is one
 ///   lock        held while the settings below root are changed, see SettingsLock
-///   index.lock, pid.lock   see PidFile
+///   index.lock  held while the index is scanned, see ScanLock
+///   daemon.lock, pid.lock  see PidFile
 ///   postgres/   the private database server, see PrivateServer
 ///   root/       what stands for "/" to the library and the platform: shares and index folders in
 ///               usr/tavo/etc, programs that the library starts

@@ -15,7 +15,8 @@ namespace {
 namespace fs = std::filesystem;
 
 fs::path file_of(const DataFolder& data) { return data.root() / "var/run/tavoindexd.pid"; }
-fs::path lock_of(const DataFolder& data) { return data.path() / "index.lock"; }
+fs::path lock_of(const DataFolder& data) { return data.path() / "daemon.lock"; }
+fs::path scan_lock_of(const DataFolder& data) { return data.path() / "index.lock"; }
 
 /// Held for the moment in which somebody finds out whose the file is: who only looks is not taken
 /// for a process that runs.
@@ -29,30 +30,31 @@ class Look {
 
 }  // namespace
 
-PidFile::PidFile(const DataFolder& data, IfTaken if_taken)
-    : file_(file_of(data)), lock_(lock_of(data)) {
-  if (!try_own(data)) {
+ScanLock::ScanLock(const DataFolder& data, IfTaken if_taken) : lock_(scan_lock_of(data)) {
+  if (!lock_.try_own()) {
     if (if_taken == IfTaken::kThrow) {
       std::string pid = "another one";
-      std::ifstream(file_) >> pid;
+      std::ifstream(scan_lock_of(data)) >> pid;
       throw AlreadyRunning("a scan is already running: process " + pid);
     }
     lock_.own();
   }
+  std::ofstream(scan_lock_of(data), std::ios::trunc) << getpid() << "\n";
+}
+
+PidFile::PidFile(const DataFolder& data) : file_(file_of(data)), lock_(lock_of(data)) {
+  const Look look(data);
+  is_ours_ = lock_.try_own();
+  if (!is_ours_) return;
   std::ofstream out(file_, std::ios::trunc);
   out << getpid() << "\n";
   out.close();
   if (!out) throw std::runtime_error(file_.string() + " cannot be written");
 }
 
-bool PidFile::try_own(const DataFolder& data) {
-  const Look look(data);
-  return lock_.try_own();
-}
-
 PidFile::~PidFile() {
   std::error_code ignored;
-  fs::remove(file_, ignored);
+  if (is_ours_) fs::remove(file_, ignored);
 }
 
 void PidFile::remove_stale(const DataFolder& data) {

@@ -16,14 +16,24 @@ struct AlreadyRunning : std::runtime_error {
   using std::runtime_error::runtime_error;
 };
 
-/// This process in "var/run/tavoindexd.pid" below the root, gone with the object: the only one that
-/// scans. Whoever is named there has to take SIGHUP as a request to read the configuration again.
-class PidFile {
+/// The right to scan, of one process at a time.
+class ScanLock {
  public:
   enum class IfTaken { kThrow, kWait };
 
   /// Throws AlreadyRunning, or waits until the other is done.
-  PidFile(const DataFolder& data, IfTaken if_taken);
+  ScanLock(const DataFolder& data, IfTaken if_taken);
+
+ private:
+  FileLock lock_;
+};
+
+/// This process in "var/run/tavoindexd.pid" below the root, gone with the object. While another
+/// process holds the file it is left alone. Whoever is named there has to take SIGHUP as a request
+/// to read the configuration again.
+class PidFile {
+ public:
+  explicit PidFile(const DataFolder& data);
   ~PidFile();
   PidFile(const PidFile&) = delete;
   PidFile& operator=(const PidFile&) = delete;
@@ -32,10 +42,9 @@ class PidFile {
   static void remove_stale(const DataFolder& data);
 
  private:
-  bool try_own(const DataFolder& data);
-
   std::filesystem::path file_;
   FileLock lock_;  ///< Held by the process that the file names, for as long.
+  bool is_ours_ = false;
 };
 
 }  // namespace mediidx::tool

@@ -38,6 +38,18 @@ TEST_F(Why, TellsThatAFileWouldBeIndexedAndByWhichFolder) {
                 media.path().string() + " (music, photos, videos)\n");
 }
 
+TEST_F(Why, KnowsWhatIgnoreFilesLeaveOut) {
+  media.write(".mediidxignore", "drafts/\n*.wav\n");
+  media.write("drafts/a.mp3", "x");
+  media.write("b.wav", "x");
+  media.write("c.mp3", "x");
+  EXPECT_EQ(reason(at("drafts/a.mp3")), "ignored");
+  EXPECT_EQ(reason(at("drafts/")), "ignored");
+  EXPECT_EQ(reason(at("b.wav")), "ignored");
+  EXPECT_EQ(reason(at("c.mp3")), "index_folder");
+  EXPECT_THAT(run({"why", at("b.wav")}).out, HasSubstr("a .mediidxignore file leaves it out"));
+}
+
 TEST_F(Why, AnswersForWhatDoesNotExist) {
   const auto answer = json({"why", at("none/b.jpg")});
   EXPECT_EQ(answer["exists"], false);

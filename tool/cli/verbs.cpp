@@ -138,7 +138,7 @@ const Verb kVerbs[] = {
      run_watch},
     {"status",
      "",
-     "show when the folders were scanned, and the files that are left alone",
+     "show when the folders were scanned, and files left alone",
      0,
      0,
      kJsonOption,

@@ -160,6 +160,7 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
   report_.switched_off = 0;
   report_.offline = 0;
   report_.is_away = false;
+  report_.away_roots.clear();
   report_.is_refused = false;
   is_settling_ = false;
   is_reconfigured_ = false;

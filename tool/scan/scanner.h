@@ -53,7 +53,8 @@ struct ScanReport {
   std::size_t failed = 0;
   std::size_t unstorable = 0;  ///< Paths that were told of because of their names or places.
   bool is_away = false;        ///< A volume was not there.
-  bool is_refused = false;     ///< A mass removal was.
+  std::vector<std::string> away_roots;  ///< Those that were not.
+  bool is_refused = false;              ///< A mass removal was.
   bool is_stopped = false;
 };
 

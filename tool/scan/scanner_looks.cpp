@@ -114,6 +114,7 @@ bool Scanner::is_away(const Root& root) {
 void Scanner::give_up(Root& root) {
   root.is_away = true;
   report_.is_away = true;
+  report_.away_roots.push_back(root.path);
   report_.offline += static_cast<std::size_t>(state_.count_files(root.path));
   if (options_.dry_run) return;
   take_offline(root.path);

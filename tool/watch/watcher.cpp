@@ -20,6 +20,7 @@ namespace {
 
 constexpr auto kHours = std::chrono::hours(6);
 constexpr auto kMinutes = std::chrono::minutes(10);
+constexpr auto kBetweenLooks = std::chrono::seconds(30);
 constexpr auto kTick = std::chrono::milliseconds(250);
 // A folder that never comes to rest is looked at all the same.
 constexpr int kRestlessTimes = 15;
@@ -111,10 +112,11 @@ void Watcher::scan_everything() {
       say_(std::string("no folder can be watched: ") + error.what());
     }
   }
-  scan({}, /*everything=*/true);
+  const bool was_away = !away_.empty();
+  away_ = scan({}, /*everything=*/true).away_roots;
   next_full_ = Clock::now() + interval();
-  away_ = outermost_index_folders();
-  std::erase_if(away_, is_there);
+  // One that is there and yet away, on another file system, is not asked for all the time.
+  next_look_ = Clock::now() + (was_away ? kBetweenLooks : Clock::duration::zero());
 }
 
 void Watcher::scan_changed() {
@@ -175,9 +177,9 @@ void Watcher::wait() {
     if (take_user_signal()) tell();
     // A disk that came or went. The kernel tells once a look.
     if (polled[1].revents & POLLPRI) is_overrun_ = true;
-    if (std::ranges::any_of(away_, is_there)) is_overrun_ = true;
     take_news();
     const auto now = Clock::now();
+    if (now >= next_look_ && std::ranges::any_of(away_, is_there)) is_overrun_ = true;
     if (is_overrun_ || now >= next_full_) return;
     for (const auto& [folder, unrest] : unrest_) {
       if (now - unrest.last >= options_.settle) return;

@@ -65,7 +65,8 @@ class Watcher {
   std::string settings_;                  ///< The folder of the configuration.
   std::unique_ptr<FolderEvents> events_;  ///< Null where the kernel cannot watch.
   std::map<std::string, Unrest> unrest_;
-  std::vector<std::string> away_;  ///< Roots that were not there, or empty.
+  std::vector<std::string> away_;  ///< Roots that the last whole scan missed.
+  Clock::time_point next_look_;    ///< For those.
   bool is_overrun_ = false;        ///< News were lost, or the settings have changed.
   int mounts_ = -1;                ///< Becomes urgent when something is mounted.
   Clock::time_point next_full_;

@@ -61,7 +61,8 @@ counts. Values lose control characters and white space at both ends, and are cut
 )";
 
 constexpr std::string_view kMusicNotes = R"(
-A song without a title is named after its file.
+A song without a title is named after its file. `mediidx inspect` shows a song's tags under the names
+that TagLib has for those of all formats (`ALBUMARTIST` for `TPE2`).
 
 Gains: without a track gain none is stored. The gain of an Opus header is no part of them: players
 apply it in any case, and the R128 tags count from there. Of ASF, several values stand in the order
@@ -74,10 +75,9 @@ ID3 text that claims to be Latin-1, ID3v1, RIFF INFO, and tags of video containe
 valid UTF-8 are read as
 
 1. UTF-8, where they are valid UTF-8;
-2. else the code page of the setting `codepage` in `/etc/tavoinfo.conf`, where there is one and the
-   text is valid in it, unless it is plainly Latin-1: under a code page of another script than
-   Latin, a text with accented letters among ASCII letters and no word of several accented letters
-   alone;
+2. else the code page that is set (`mediidx doctor` tells which), where there is one and the text is
+   valid in it, unless it is plainly Latin-1: under a code page of another script than Latin, a text
+   with accented letters among ASCII letters and no word of several accented letters alone;
 3. else Latin-1.
 
 ### What the sound tells

@@ -95,6 +95,20 @@ TEST_F(ACodePageOfTheSystem, ReachesTheWorkers) {
   EXPECT_EQ(answer->file.title, "Запруда");
 }
 
+TEST(ACodePageInTheDataFolder, IsTheOneOfTheIndex) {
+  TestServer::get().fresh_database();
+  const OpenFolder folder;
+  std::filesystem::create_directory(folder.at("m"));
+  const auto first = run_mediidx({"index", "--data-dir", folder.at("d"), folder.at("m")});
+  ASSERT_EQ(first.status, 0) << first.err;
+  folder.write("d/root/etc/tavoinfo.conf", "codepage=\"jpn\"\n");
+  std::filesystem::copy(tag_sample("encodings/id3v2-cp932.mp3"), folder.at("m/a.mp3"));
+  const auto run = run_mediidx({"index", "--data-dir", folder.at("d"), folder.at("m")});
+  ASSERT_EQ(run.status, 0) << run.err;
+  EXPECT_EQ(TestServer::get().rows("SELECT title, artist FROM music"),
+            (std::vector<Row>{{"波止場", "波止場; 波止場 2"}}));
+}
+
 /// Half a megabyte of text that is valid in no way.
 TEST_F(ACodePage, StandsHugeAndBrokenTexts) {
   for (const char* page : {"", "rus", "jpn", "UTF-16", "UTF-7", "ISO-2022-JP"}) {

@@ -59,7 +59,7 @@ def ffmpeg(*words):
     run("ffmpeg", "-nostdin", "-v", "error", "-y", *words)
 
 
-# -- Music -------------------------------------------------------------------------------------------
+# -- Music -----------------------------------------------------------------------------------------
 
 
 def make_sounds():
@@ -191,8 +191,8 @@ def tagged_in_full():
         f"--import-picture-from={work / 'cover.jpg'}",
         f"--import-picture-from=4||||{work / 'cover.jpg'}", flac)
     covers = {"METADATA_BLOCK_PICTURE": [picture_block(), picture_block()]}
-    for name, file_type in (("ogg", mutagen.oggvorbis.OggVorbis), ("spx", mutagen.oggspeex.OggSpeex),
-                            ("oga", mutagen.oggflac.OggFLAC)):
+    for name, file_type in (("ogg", mutagen.oggvorbis.OggVorbis),
+                            ("spx", mutagen.oggspeex.OggSpeex), ("oga", mutagen.oggflac.OggFLAC)):
         add_xiph(copy("a." + name, "full." + name), file_type, {**xiph_fields(), **covers})
     fields = {**xiph_fields(), **covers, "R128_TRACK_GAIN": ["-1280"], "R128_ALBUM_GAIN": ["-640"]}
     for name in GAINS:
@@ -239,7 +239,8 @@ def tag_m4a(path):
 def tag_wma(path):
     tags = mutagen.asf.ASF(path)
     tags["Title"], tags["WM/AlbumTitle"], tags["Author"] = [TITLE], [ALBUM], ARTISTS
-    tags["WM/AlbumArtist"], tags["WM/Genre"], tags["WM/Composer"] = [ALBUM_ARTIST], GENRES, COMPOSERS
+    tags["WM/AlbumArtist"], tags["WM/Genre"] = [ALBUM_ARTIST], GENRES
+    tags["WM/Composer"] = COMPOSERS
     tags["Description"], tags["WM/Year"] = [COMMENT], [DATE]
     tags["WM/TrackNumber"] = [mutagen.asf.ASFDWordAttribute(3)]
     tags["WM/PartOfSet"] = ["2/3"]
@@ -278,12 +279,13 @@ def claimed(text, charset):
 
 
 def old_encodings():
-    for name, text, charset in (("cp1251", CYRILLIC, "cp1251"), ("cp932", "波止場", "cp932"),
-                                ("cp936", "灯塔", "gbk"), ("cp1250", "Łódź", "cp1250"),
-                                ("latin1", "Zoë Ångström", "latin-1"), ("utf8", "夜の港", "utf-8")):
+    for name, text, charset in (
+            ("cp1251", CYRILLIC, "cp1251"), ("cp932", "波止場", "cp932"), ("cp936", "灯塔", "gbk"),
+            ("cp1250", "Łódź", "cp1250"), ("latin1", "Zoë Ångström", "latin-1"),
+            ("utf8", "夜の港", "utf-8")):
         raw = claimed(text, charset)
         id3_only(copy("a.mp3", f"encodings/id3v2-{name}.mp3"),
-                 [TIT2(0, [raw]), TPE1(0, [raw, raw + " 2"]), TPE2(0, [raw]), TXXX(0, "ARTISTS", [raw]),
+                 [TIT2(0, [raw]), TPE1(0, [raw, raw + " 2"]), TPE2(0, [raw]),
                   COMM(0, "eng", "", [raw])], v1=0)
         with open(copy("a.mp3", f"encodings/id3v1-{name}.mp3"), "ab") as file:
             file.write(id3v1(text.encode(charset), text.encode(charset)))
@@ -337,13 +339,14 @@ def odd_ones():
     copy("a.dts", "untagged.dts")
     named = ["-metadata", "title=Slack Water", "-metadata", "artist=Ada Brandt"]
     ffmpeg("-i", work / "a.wav", *named, "-metadata", "album=Low Tide", out / "some.au")
-    ffmpeg("-i", work / "a.wav", *named, "-metadata", "author=Ada Brandt", "-ar", "8000", "-ac", "1", "-c:a", "real_144",
-           out / "some.ra")
+    ffmpeg("-i", work / "a.wav", *named, "-metadata", "author=Ada Brandt", "-ar", "8000",
+           "-ac", "1", "-c:a", "real_144", out / "some.ra")
     for name, value in (("day", "2004-05-01"), ("month", "2004-05"), ("year", "2004"),
                         ("compact", "20040501"), ("time", "2004-05-01T12:00:00"), ("words", "May")):
         add_xiph(copy("a.flac", f"dates/{name}.flac"), mutagen.flac.FLAC, {"DATE": [value]})
     add_xiph(copy("a.flac", "many.flac"), mutagen.flac.FLAC,
-             {"GENRE": [f"Genre {i}" for i in range(2000)], "ARTIST": ["Twice", "Twice", " ", "Once"]})
+             {"GENRE": [f"Genre {i}" for i in range(2000)],
+              "ARTIST": ["Twice", "Twice", " ", "Once"]})
 
 
 def set_output_gain(path, gain):
@@ -362,7 +365,7 @@ def set_output_gain(path, gain):
     path.write_bytes(data)
 
 
-# -- Photos ------------------------------------------------------------------------------------------
+# -- Photos ----------------------------------------------------------------------------------------
 
 CAMERA = [
     "Exif.Image.Make Ascii Lumen ", "Exif.Image.Model Ascii L-1", "Exif.Image.Orientation Short 6",
@@ -446,7 +449,7 @@ def make_heic(path):
     path.write_bytes(kind + meta(len(kind) + len(meta(0)) + 8) + box(b"mdat", exif))
 
 
-# -- Videos ------------------------------------------------------------------------------------------
+# -- Videos ----------------------------------------------------------------------------------------
 
 
 def film(name, *codecs):
@@ -462,8 +465,8 @@ def videos():
     first = ["-map", "1", "-ac:a:0", "1", "-b:a:0", "64k"]
     h264 = ["-c:v", "libx264", "-preset", "veryfast", "-profile:v", "main", "-level:v", "3.1"]
     # The second sound is the one that players prefer, by its channels and its mark.
-    film("two-sounds.mp4", *first, "-map", "2", *h264, "-c:a:0", "aac", "-c:a:1", "ac3", "-ac:a:1", "2",
-         "-disposition:a:0", "0", "-disposition:a:1", "default")
+    film("two-sounds.mp4", *first, "-map", "2", *h264, "-c:a:0", "aac", "-c:a:1", "ac3",
+         "-ac:a:1", "2", "-disposition:a:0", "0", "-disposition:a:1", "default")
     film("film.mov", *first, *h264, "-c:a", "aac")
     film("film.ts", *first, *h264, "-c:a", "mp2")
     film("film.flv", *first, *h264, "-c:a", "libmp3lame")
@@ -476,7 +479,8 @@ def videos():
     film("film.mpg", *first, "-c:v", "mpeg2video", "-c:a", "mp2")
     film("silent.mp4", *h264)
     avi = (out / "videos" / "film.avi").read_bytes()
-    (out / "videos" / "cp1251.avi").write_bytes(avi.replace(b"Cast Off", "Причалы".encode("cp1251") + b" "))
+    title = "Причалы".encode("cp1251") + b" "
+    (out / "videos" / "cp1251.avi").write_bytes(avi.replace(b"Cast Off", title))
 
 
 out = pathlib.Path(sys.argv[1])

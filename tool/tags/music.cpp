@@ -29,7 +29,7 @@ struct SoundColumn {
 constexpr SoundColumn kSoundColumns[] = {
     {{"duration", "the sound's length", "seconds with a fraction; the row holds whole ones"},
      [](const Sound& sound, MediaFile& file) {
-       file.duration = sound.audio.lengthInMilliseconds() / static_cast<double>(kKilo);
+       file.duration = std::max(sound.audio.lengthInMilliseconds(), 0) / static_cast<double>(kKilo);
      }},
     {{"bitrate", "the sound's mean rate", "bits a second, to the thousand"},
      [](const Sound& sound, MediaFile& file) {

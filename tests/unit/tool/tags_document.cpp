@@ -38,6 +38,7 @@ constexpr SampledFormat kPhotos[] = {
     {"GIF, BMP, AVIF", "ffmpeg; of these the size only", false},
     {"HEIC", "heif-enc, for the size; our own writer, for the settings", true},
     {"DNG, NEF", "a TIFF of ffmpeg's, with settings of exiv2's", true},
+    {"CR2, ORF", "our own writer, for the settings", true},
     {"other raw files", "never tried", true},
 };
 

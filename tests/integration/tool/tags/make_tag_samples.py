@@ -4,8 +4,8 @@
 """make_tag_samples.py FOLDER: one small file of each format, tagged in full, and the odd ones.
 
 Encoded by stock tools and tagged by them or by mutagen, which is no kin of the readers under test.
-Monkey's Audio, DSF and a HEIC with camera settings have no free writer: here stands a minimal one
-for each.
+Monkey's Audio, DSF, CR2, ORF and a HEIC with camera settings have no free writer: here stands a
+minimal one for each.
 """
 
 import os
@@ -327,6 +327,13 @@ def odd_ones():
         file.write(id3v1(b"From ID3v1", b"Old Artist"))
     id3_only(copy("a.mp3", "rva2.mp3"),
              [RVA2("track", 1, -4.5, 0.5), RVA2("album", 1, -3.25, 0.75)], v1=0)
+    # As MP3Gain leaves files.
+    gained = copy("a.mp3", "id3v1-and-ape.mp3")
+    tags = mutagen.apev2.APEv2()
+    tags["REPLAYGAIN_TRACK_GAIN"], tags["REPLAYGAIN_TRACK_PEAK"] = "-6.01 dB", "0.5"
+    tags.save(gained)
+    with open(gained, "ab") as file:
+        file.write(id3v1(b"From ID3v1", b"Old Artist"))
     info_wav("info.wav", {b"INAM": b"Slack Water", b"IPRD": b"Low Tide", b"IART": b"Ada Brandt",
                           b"IGNR": b"Folk", b"ICMT": b"at the quay", b"ICRD": b"2004-05",
                           b"ITRK": b"3/12", b"IMUS": b"Jo Reed"})
@@ -401,6 +408,7 @@ def photos():
         shutil.copy(work / f"p.{suffix}", out / "photos" / f"plain.{suffix}")
     run("heif-enc", "-q", "30", work / "p.jpg", "-o", out / "photos" / "plain.heic")
     make_heic(out / "photos" / "full.heic")
+    make_raws()
     for orientation in range(1, 9):
         photo(f"orientation-{orientation}.jpg", [f"Exif.Image.Orientation Short {orientation}"])
     for name, value in (("fast", "1/4000"), ("third", "1/3"), ("half", "5/10"), ("long", "25/10"),
@@ -416,6 +424,45 @@ def photos():
     photo("latin1.jpg", ["Exif.Image.Make Ascii Lumen"])
     path = out / "photos" / "latin1.jpg"
     path.write_bytes(path.read_bytes().replace(b"Lumen\0", b"Lum\xe9n\0"))
+
+
+def directory(offset, entries, more=b""):
+    """A directory of TIFF that stands at this offset: entries of tag, kind, count and bytes."""
+    place = offset + 2 + 12 * len(entries) + 4
+    head, values = struct.pack("<H", len(entries)), b""
+    for tag, kind, count, data in sorted(entries):
+        if len(data) > 4:
+            head += struct.pack("<HHII", tag, kind, count, place + len(values))
+            values += data + b"\0" * (len(data) % 2)
+        else:
+            head += struct.pack("<HHI", tag, kind, count) + data.ljust(4, b"\0")
+    return head + bytes(4) + values + more
+
+
+def raw_directories(offset):
+    """The camera and its settings, and a picture of 128 by 64 of which nothing is there."""
+    def short(value):
+        return struct.pack("<H", value)
+
+    def pair(first, second):
+        return struct.pack("<II", first, second)
+
+    settings = [(0x829A, 5, 1, pair(1, 125)), (0x829D, 5, 1, pair(28, 10)),
+                (0x8827, 3, 1, short(200)), (0x9003, 2, 20, b"2021:06:12 10:30:00\0"),
+                (0xA002, 3, 1, short(128)), (0xA003, 3, 1, short(64))]
+    camera = [(0x0100, 3, 1, short(128)), (0x0101, 3, 1, short(64)), (0x010F, 2, 6, b"Lumen\0"),
+              (0x0110, 2, 4, b"L-1\0"), (0x0112, 3, 1, short(6))]
+    length = len(directory(offset, [*camera, (0x8769, 4, 1, bytes(4))]))
+    place = struct.pack("<I", offset + length)
+    return directory(offset, [*camera, (0x8769, 4, 1, place)],
+                     directory(offset + length, settings))
+
+
+def make_raws():
+    photos_folder = out / "photos"
+    cr2 = b"II*\0" + struct.pack("<I", 16) + b"CR\2\0" + bytes(4)
+    (photos_folder / "full.cr2").write_bytes(cr2 + raw_directories(16))
+    (photos_folder / "full.orf").write_bytes(b"IIRO" + struct.pack("<I", 8) + raw_directories(8))
 
 
 def box(kind, *parts, version=None):

@@ -124,6 +124,13 @@ TEST(AGapInTheFirstTag, IsFilledFromTheNext) {
   EXPECT_EQ(file.track, 7);
 }
 
+TEST(ReplayGainOfAnMp3, MayStandInApe) {
+  const auto file = read_sample("id3v1-and-ape.mp3");
+  EXPECT_EQ(file.title, "From ID3v1");
+  EXPECT_EQ(file.gain.track_gain, -6.01);
+  EXPECT_EQ(file.gain.track_peak, 0.5);
+}
+
 TEST(RiffInfo, IsReadWhereAWavHasNoId3) {
   EXPECT_EQ(fields_of("info.wav"), (Fields{{"title", "Slack Water"},
                                            {"album", "Low Tide"},

@@ -26,8 +26,15 @@ TEST(AllSettings, OfAWebpAreRead) { EXPECT_EQ(fields_of("photos/full.webp"), kFu
 TEST(AllSettings, OfADngAreRead) { EXPECT_EQ(fields_of("photos/full.dng"), kFull); }
 TEST(AllSettings, OfANefAreRead) { EXPECT_EQ(fields_of("photos/full.nef"), kFull); }
 
+/// These have no place for the title here.
 TEST(AllSettings, OfAHeicAreRead) {
   EXPECT_EQ(fields_of("photos/full.heic"), with(kFull, {{"title", "full"}}));
+}
+TEST(AllSettings, OfACr2AreRead) {
+  EXPECT_EQ(fields_of("photos/full.cr2"), with(kFull, {{"title", "full"}}));
+}
+TEST(AllSettings, OfAnOrfAreRead) {
+  EXPECT_EQ(fields_of("photos/full.orf"), with(kFull, {{"title", "full"}}));
 }
 
 TEST(APictureWithoutSettings, HasItsSize) {

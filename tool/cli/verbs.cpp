@@ -71,6 +71,9 @@ constexpr Option kRatingExportOptions[] = {
     {"--json", nullptr, "print JSON"},
 };
 
+constexpr const char* kScanStatuses =
+    "0 done, 1 failed or a mass removal refused, 2 usage, 3 done but for some files, 4 a volume was "
+    "away, 5 no database, 6 a scan is running, 130 and 143 stopped by a signal";
 constexpr Option kFullSpeed{"--full-speed", nullptr,
                             "do not leave the processor and the disks to others"};
 constexpr Option kIndexOptions[] = {kFullSpeed};
@@ -119,7 +122,8 @@ const Verb kVerbs[] = {
      kAnyNumber,
      kIndexOptions,
      {},
-     run_index},
+     run_index,
+     kScanStatuses},
     {"scan",
      "[PATH...]",
      "bring the index up to date, of all chosen folders or these",
@@ -127,7 +131,8 @@ const Verb kVerbs[] = {
      kAnyNumber,
      kScanOptions,
      {},
-     run_scan},
+     run_scan,
+     kScanStatuses},
     {"watch",
      "",
      "scan, then follow what changes in the folders chosen for indexing",

@@ -74,7 +74,9 @@ int add_folder(const DataFolder& data, const std::string& folder) {
   const auto folders = folders_to_scan(folder);
   if (folders.empty()) return kExitDone;
   Database database(data);
-  return exit_status(run_scanner(data, database, folders, {}));
+  ScanSetting setting;
+  setting.options.wait = true;
+  return exit_status(run_scanner(data, database, folders, setting));
 }
 
 int drop_folder(const DataFolder& data, const std::string& folder) {

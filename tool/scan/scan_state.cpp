@@ -4,7 +4,9 @@
 
 #include <unistd.h>
 
+#include <array>
 #include <chrono>
+#include <thread>
 #include <utility>
 
 #include "store/query.h"
@@ -14,6 +16,9 @@ namespace {
 
 // A statement of this many rows is a few hundred kilobytes at most.
 constexpr std::size_t kRowsOfAStatement = 500;
+
+// Any number that nobody else takes.
+constexpr std::int64_t kScanRight = 6334281;
 
 std::string number(std::int64_t value) { return std::to_string(value); }
 template <class Enum>
@@ -71,7 +76,31 @@ const std::string kTouchedSheets =
 
 }  // namespace
 
-void ScanState::begin() {
+void ScanState::take_right(bool wait) {
+  // A session that was cut, by a killed scan for one, gives it up in a moment.
+  constexpr int kTries = 50;
+  for (int i = 0; wait || i < kTries; ++i) {
+    auto rows = database_.query("SELECT pg_try_advisory_lock(" + number(kScanRight) + ") AS taken");
+    if (rows.next() && rows.flag("taken")) return;
+    std::this_thread::sleep_for(std::chrono::milliseconds(100));
+  }
+  auto rows = database_.query(
+      "SELECT a.application_name AS name FROM pg_locks l JOIN pg_stat_activity a ON a.pid = l.pid "
+      "WHERE l.locktype = 'advisory' AND l.granted AND l.objid = " +
+      number(kScanRight));
+  throw AlreadyRunning("a scan is already running: " +
+                       (rows.next() ? rows.text("name") : "in another session"));
+}
+
+void ScanState::end() { database_.query("SELECT pg_advisory_unlock(" + number(kScanRight) + ")"); }
+
+void ScanState::begin(bool wait) {
+  std::array<char, 256> host{};
+  gethostname(host.data(), host.size() - 1);
+  database_.query("SELECT set_config('application_name', " +
+                  literal("mediidx, process " + std::to_string(getpid()) + " on " + host.data()) +
+                  ", false)");
+  take_right(wait);
   const auto now = std::chrono::steady_clock::now().time_since_epoch().count();
   token_ = std::to_string(getpid()) + "-" + std::to_string(now);
   database_.run("DELETE FROM scan.change");

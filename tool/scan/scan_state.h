@@ -15,6 +15,7 @@
 #include "scan/coverage.h"
 #include "scan/file_walk.h"
 #include "store/database.h"
+#include "store/pid_file.h"
 
 namespace mediidx::tool {
 
@@ -97,8 +98,11 @@ class ScanState {
  public:
   explicit ScanState(Database& database) : database_(database) {}
 
-  /// Forgets what an earlier scan had planned.
-  void begin();
+  /// Takes the right to scan this database, which another machine may have, and forgets what an
+  /// earlier scan had planned. Throws AlreadyRunning, or waits.
+  void begin(bool wait);
+  /// Gives it up.
+  void end();
   /// False when the connection was lost since then, also when there is another one by now.
   bool is_same_connection();
 
@@ -166,6 +170,7 @@ class ScanState {
   void add_unknown(std::span<const ListedFolder> folders, std::map<std::string, KnownFolder>& out);
   void mark_lost(const std::string& folder);
   void take_up(const std::string& folder);
+  void take_right(bool wait);
   std::vector<Change> changes(const std::string& condition, int limit);
 
   Database& database_;

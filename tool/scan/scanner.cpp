@@ -132,6 +132,8 @@ ScanReport Scanner::run(const std::vector<std::string>& folders) {
       run_once(folders);
       report_.skipped += report_.unstorable;
       return report_;
+    } catch (const AlreadyRunning&) {
+      throw;
     } catch (const DatabaseLost&) {
       if (options_.dry_run) throw;
     } catch (const std::runtime_error&) {
@@ -170,15 +172,17 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
   while (workers_.outstanding() > 0) workers_.take(kBetweenTries);
 
   if (options_.dry_run) database_.run("BEGIN");
-  state_.begin();
+  state_.begin(options_.wait);
   plan(starts_for(folders));
   if (options_.dry_run) {
     count_plan();
     database_.run("ROLLBACK");
+    state_.end();
     return;
   }
   if (!stops()) apply();
   if (!stops()) settle();
+  state_.end();
 }
 
 // -- Doing ---------------------------------------------------------------------------------------

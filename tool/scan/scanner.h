@@ -34,6 +34,7 @@ struct ScanOptions {
   bool allow_mass_delete = false;  ///< Remove however much is gone.
   bool accept_volumes = false;     ///< Take what is mounted now as right.
   bool trust_index = false;        ///< Nobody else has changed the index since the last scan.
+  bool wait = false;               ///< For another scan of the same database.
   bool pass_over_open = false;     ///< Leave files for later that somebody is writing now.
   FileWalk::Before before;         ///< Told of each folder before it is listed; may be empty.
   FileWalk::Descend descend;       ///< Asked whether to walk a subfolder; may be empty.

@@ -136,6 +136,7 @@ void Watcher::scan_changed() {
 ScanReport Watcher::scan(const std::vector<std::string>& folders, bool everything) {
   auto setting = options_.scan;
   setting.options.pass_over_open = true;
+  setting.options.wait = true;
   bool has_room = true;
   setting.options.before = [&](const std::string& folder) {
     if (events_ && !events_->watch(folder)) has_room = false;

@@ -239,6 +239,27 @@ TEST_F(ARunningScan, SaysThatAnotherOneRuns) {
             "mediidx: a scan is already running: process " + std::to_string(first) + "\n");
 }
 
+TEST_F(ARunningScan, IsTheOnlyOneOfItsDatabaseFromOtherDataFoldersToo) {
+  fill(1500);
+  choose();
+  const OpenFolder elsewhere;
+  Setting setting;
+  pid_t first = 0;
+  Outcome second{};
+  setting.meanwhile = [&](pid_t pid) {
+    first = pid;
+    while (count("pg_stat_activity", "application_name LIKE 'mediidx, process %'") == 0)
+      usleep(1000);
+    kill(pid, SIGSTOP);
+    second = run_mediidx({"--data-dir", elsewhere.at("d"), "index", media.at("m")});
+    kill(pid, SIGCONT);
+  };
+  EXPECT_EQ(scan({"--full"}, setting).status, 0);
+  EXPECT_EQ(second.status, 6);
+  EXPECT_THAT(second.err, HasSubstr("a scan is already running: mediidx, process " +
+                                    std::to_string(first) + " on "));
+}
+
 TEST_F(ARunningScan, WithoutADatabaseEndsWithFive) {
   Setting setting;
   setting.environment["PGHOST"] = media.at("nothing-here");

@@ -143,7 +143,20 @@ bool Connection::make_alive() {
 OwnedRows Connection::run(const std::string& statement) {
   affected_rows_ = -1;
   if (!make_alive()) return nullptr;
-  OwnedRows rows(PQexec(conn_.get(), statement.c_str()));
+  return take(PQexec(conn_.get(), statement.c_str()));
+}
+
+OwnedRows Connection::run(const std::string& statement, std::span<const char* const> values) {
+  affected_rows_ = -1;
+  if (!make_alive()) return nullptr;
+  constexpr int kAsText = 0;
+  return take(PQexecParams(conn_.get(), statement.c_str(), static_cast<int>(values.size()), nullptr,
+                           values.data(), nullptr, nullptr, kAsText));
+}
+
+/// What became of a statement.
+OwnedRows Connection::take(PGresult* answer) {
+  OwnedRows rows(answer);
   const auto transaction = PQtransactionStatus(conn_.get());
   in_transaction_ = transaction == PQTRANS_INTRANS || transaction == PQTRANS_INERROR;
   switch (PQresultStatus(rows.get())) {
@@ -161,6 +174,33 @@ OwnedRows Connection::run(const std::string& statement) {
       set_error(PQerrorMessage(conn_.get()));
       return nullptr;
   }
+}
+
+bool Connection::copy(const std::string& statement, std::string_view rows) {
+  affected_rows_ = -1;
+  if (!make_alive()) return false;
+  OwnedRows begun(PQexec(conn_.get(), statement.c_str()));
+  if (PQresultStatus(begun.get()) != PGRES_COPY_IN) {
+    if (take(begun.release())) set_error("not a COPY from the client");
+    affected_rows_ = -1;
+    return false;
+  }
+  constexpr std::size_t kMost = 1 << 20;
+  bool sent = true;
+  for (; sent && !rows.empty(); rows.remove_prefix(std::min(rows.size(), kMost))) {
+    const auto piece = rows.substr(0, kMost);
+    sent = PQputCopyData(conn_.get(), piece.data(), static_cast<int>(piece.size())) == 1;
+  }
+  sent = sent && PQputCopyEnd(conn_.get(), nullptr) == 1;
+  if (!sent) {
+    set_error(PQerrorMessage(conn_.get()));
+    const OwnedRows left(PQexec(conn_.get(), ""));  // leaves the copying
+    return false;
+  }
+  OwnedRows copied(PQgetResult(conn_.get()));
+  while (OwnedRows(PQgetResult(conn_.get()))) {
+  }
+  return take(copied.release()) != nullptr;
 }
 
 namespace {

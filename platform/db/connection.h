@@ -9,7 +9,9 @@
 #include <tavodb.h>
 
 #include <memory>
+#include <span>
 #include <string>
+#include <string_view>
 
 #include "result.h"
 
@@ -31,6 +33,10 @@ class Connection {
   /// sent. Before it is sent, a session found dead is taken up again; but not within a transaction,
   /// whose earlier statements are lost: this one fails and the next starts afresh.
   OwnedRows run(const std::string& statement);
+  /// The same with values for "$1" and so on, null for SQL null.
+  OwnedRows run(const std::string& statement, std::span<const char* const> values);
+  /// The same for "COPY … FROM STDIN" and its rows; false when it failed.
+  bool copy(const std::string& statement, std::string_view rows);
 
   /// Rows that the last statement touched or returned; -1 when it failed.
   int affected_rows() const { return affected_rows_; }
@@ -43,6 +49,7 @@ class Connection {
   bool is_alive();
   bool make_alive();
   bool settle();
+  OwnedRows take(PGresult* answer);
   static void receive_notice(void* connection, const PGresult* notice);
 
   std::unique_ptr<PGconn, FinishConnection> conn_;

@@ -14,6 +14,7 @@
 #include "mediidx/cue_sheet.h"
 #include "mediidx/playlist.h"
 #include "mediidx/request.h"
+#include "playlist/cue_durations.h"
 #include "playlist/cue_position.h"
 #include "support/log.h"
 #include "support/owned.h"
@@ -56,9 +57,20 @@ struct FileEnd {
   std::optional<std::int32_t> frames;  ///< Empty when the index does not know the file.
 };
 
+bool is_indexed(const std::string& audio_path) {
+  return TAVOMediaIndexIsIndexPath(audio_path.c_str(), MEDIA_TABLE_MUSIC) > 0;
+}
+
+FileEnd known_file_end(CueDurations& durations, const std::string& audio_path) {
+  if (!is_indexed(audio_path)) return {};
+  const auto duration = durations.find(audio_path);
+  if (!duration) return {};
+  return {false, frames_from_seconds(std::strtod(duration->c_str(), nullptr))};
+}
+
 FileEnd find_file_end(tavodb_connection* conn, const std::string& audio_path) {
   constexpr FileEnd kFailed{true, std::nullopt};
-  if (TAVOMediaIndexIsIndexPath(audio_path.c_str(), MEDIA_TABLE_MUSIC) <= 0) return {};
+  if (!is_indexed(audio_path)) return {};
   const auto sql = fill(TAVODBDatabaseTypeGet(conn), kSelectMusic, audio_path.c_str());
   if (!sql) return kFailed;
   OwnedResult result;
@@ -139,13 +151,18 @@ int MediaInfoCueParser::CalDuration(std::string endPos, int trackIndex) {
 }
 
 int MediaInfoCueParser::CalDurationOfLast(int trackIndex) {
-  tavodb_connection* conn = PersonalLibraryDBConnect();
-  if (!conn) {
-    kCueLog.colon(239, "Failed to connect to database.");
-    return 1;  // the track keeps the duration that it has
+  mediidx::FileEnd end;
+  if (auto* durations = mediidx::CueDurations::current()) {
+    end = mediidx::known_file_end(*durations, currentFile);
+  } else {
+    tavodb_connection* conn = PersonalLibraryDBConnect();
+    if (!conn) {
+      kCueLog.colon(239, "Failed to connect to database.");
+      return 1;  // the track keeps the duration that it has
+    }
+    end = mediidx::find_file_end(conn, currentFile);
+    PersonalLibraryDBClose();
   }
-  const auto end = mediidx::find_file_end(conn, currentFile);
-  PersonalLibraryDBClose();
   if (end.failed) return 0;
   if (end.frames) return CalDuration(mediidx::position_from_frames(*end.frames), trackIndex);
   // Callers know a file that is not indexed by a duration of minus the track's start.

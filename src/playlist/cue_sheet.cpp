@@ -8,6 +8,7 @@
 #include <string_view>
 
 #include "playlist/cue_charset.h"
+#include "playlist/cue_durations.h"
 #include "support/log.h"
 #include "support/no_throw.h"
 
@@ -17,6 +18,7 @@ namespace {
 using LineBuffer = std::array<char, 1024>;
 
 bool parse_line(MediaInfoCueParser& parser, const char* line, const char* cue_path, int log_line) {
+  if (auto* durations = CueDurations::current()) durations->keep_line(line);
   if (parser.ParseCommand(line, cue_path) != 0) return true;
   kCueLog.colon(log_line, "Failed to parse command [%s]", line);
   return false;

@@ -23,6 +23,13 @@ MEDIIDX_EXPORT int TAVOMediaIndexAdd(struct __tag_TAVO_MEDIA_INFO* info, MEDIA_T
 /// The same request under its second name.
 MEDIIDX_EXPORT int TAVOMediaIndexReindexUpdate(struct __tag_TAVO_MEDIA_INFO* info,
                                                MEDIA_TABLE_TYPE type);
+/// Adds `count` files of one type, as if each were added in turn, but together: in one transaction,
+/// and in as many round trips to the database for a thousand records as for one. 0, or -1 when any
+/// failed. `results` (null when of no interest) receives one result a record, as TAVOMediaIndexAdd
+/// gives it. The texts of the records are trimmed; a music add sets their ids. Where the database
+/// refuses the files together, they are added one by one, so that only the bad ones fail.
+MEDIIDX_EXPORT int TAVOMediaIndexAddMany(struct __tag_TAVO_MEDIA_INFO* records, unsigned count,
+                                         MEDIA_TABLE_TYPE type, int* results);
 /// Removes a file that is gone; -1 while it still exists.
 MEDIIDX_EXPORT int TAVOMediaIndexDelete(const char* path);
 /// Moves a file. A move into the index gives -1 even when it succeeded.
@@ -33,6 +40,10 @@ MEDIIDX_EXPORT int TAVOMediaIndexRename(struct __tag_TAVO_MEDIA_INFO* info, MEDI
 /// MediaInfoJson2Object reads them, and optionally "rg_track_gain", "rg_track_peak",
 /// "rg_album_gain" and "rg_album_peak".
 MEDIIDX_EXPORT int TAVOMediaIndexAdd_Json(const Json::Value& json, MEDIA_TABLE_TYPE type);
+/// TAVOMediaIndexAddMany for an array of such objects; `results` has room for one result each. A
+/// value that is no array gives -1, and no results.
+MEDIIDX_EXPORT int TAVOMediaIndexAddMany_Json(const Json::Value& array, MEDIA_TABLE_TYPE type,
+                                              int* results);
 MEDIIDX_EXPORT int TAVOMediaIndexReindexUpdate_Json(const Json::Value& json, MEDIA_TABLE_TYPE type);
 MEDIIDX_EXPORT int TAVOMediaIndexRename_Json(const Json::Value& json, MEDIA_TABLE_TYPE type,
                                              const char* oldPath);
@@ -41,6 +52,9 @@ MEDIIDX_EXPORT int TAVOMediaIndexRename_Json(const Json::Value& json, MEDIA_TABL
 /* Folders */
 
 MEDIIDX_EXPORT int TAVOMediaIndexDirAdd(const DIR_INFO_REC* dirInfo);
+/// Adds `count` folders together; otherwise like TAVOMediaIndexAddMany.
+MEDIIDX_EXPORT int TAVOMediaIndexDirAddMany(const DIR_INFO_REC* records, unsigned count,
+                                            int* results);
 MEDIIDX_EXPORT int TAVOMediaIndexReindexDirUpdate(const DIR_INFO_REC* dirInfo);
 /// Removes a folder and everything below it. An empty path is refused with -1.
 MEDIIDX_EXPORT int TAVOMediaIndexDirDelete(const char* path);

@@ -8,9 +8,9 @@
 #include <memory>
 #include <optional>
 
+#include "api/add_file.h"
 #include "api/file_path.h"
 #include "api/replay_gain.h"
-#include "api/virtual_tracks.h"
 #include "mediidx/database.h"
 #include "mediidx/request.h"
 #include "support/log.h"
@@ -21,22 +21,9 @@ namespace {
 
 using Record = __tag_TAVO_MEDIA_INFO;
 
-constexpr int kAddBadParameter = 110;
-constexpr int kNotSaved = 111;
-constexpr int kGainNotSaved = 112;
 constexpr int kStillThere = 120;
 constexpr int kNotRemoved = 121;
 constexpr int kRenameBadParameter = 130;
-
-int add_bad_parameter() {
-  kRequestLog.colon(kAddBadParameter, "Bad parameter");
-  return -1;
-}
-
-int not_saved() {
-  kRequestLog.colon(kNotSaved, "Failed to save media info.");
-  return -1;
-}
 
 bool belongs(const char* path, MEDIA_TABLE_TYPE type) {
   return TAVOMediaIndexIsIndexPath(path, type) > 0;
@@ -44,29 +31,17 @@ bool belongs(const char* path, MEDIA_TABLE_TYPE type) {
 
 int add(Record* info, MEDIA_TABLE_TYPE type) {
   if (!info) return add_bad_parameter();
-  if (!is_no_folder(info->path)) return -1;
-  if (!belongs(info->path, type)) return 0;
-  if (MediaInfoDBSave(type, info) != 0) return not_saved();
-  return add_virtual_tracks(*info, type);
-}
-
-int save_replay_gain(const Json::Value& json, std::uint32_t id) {
-  const auto gains = find_replay_gain(json);
-  if (!gains || MediaInfoAudioRGMetadataDBSave(gains->data(), id) == 0) return 0;
-  kRequestLog.colon(kGainNotSaved, "Failed to save replayGain metadata.");
-  return -1;
+  if (const auto result = result_without_save(info->path, type)) return *result;
+  return save_file(*info, type);
 }
 
 int add(const Json::Value& json, MEDIA_TABLE_TYPE type) {
   const char* path = find_path(json);
   if (!path) return add_bad_parameter();
-  if (!is_no_folder(path)) return -1;
-  if (!belongs(path, type)) return 0;
+  if (const auto result = result_without_save(path, type)) return *result;
   const auto info = std::make_unique<Record>();
-  if (MediaInfoJson2Object(json, info.get()) != 0) return not_saved();
-  if (MediaInfoDBSave(type, info.get()) != 0) return not_saved();
-  if (type == MEDIA_TABLE_MUSIC) return save_replay_gain(json, info->id);
-  return add_virtual_tracks(*info, type);
+  if (MediaInfoJson2Object(json, info.get()) != 0) return file_not_saved();
+  return save_file(*info, type, find_replay_gain(json));
 }
 
 /// What a file of this extension is; nothing when it is no medium.

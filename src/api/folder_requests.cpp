@@ -4,6 +4,7 @@
 // Adding, removing and moving a folder; clearing what is to be indexed again.
 #include <tavocore.h>
 
+#include "api/add_folder.h"
 #include "mediidx/database.h"
 #include "mediidx/request.h"
 #include "support/log.h"
@@ -33,14 +34,8 @@ int add_folder(const DIR_INFO_REC* folder) {
     kRequestLog.colon(kAddBadParameter, "Bad parameter");
     return -1;
   }
-  if (!IsDirExist(folder->path)) {
-    kRequestLog.colon(kNoFolder, "Path should be a directory, not a file: %s", folder->path);
-    return -1;
-  }
-  if (!belongs(folder->path)) return 0;
-  if (DirInfoDBSave(folder) == 0) return 0;
-  kRequestLog.colon(kNotSaved, "Failed to save dir info.");
-  return -1;
+  if (const auto result = result_without_save(*folder)) return *result;
+  return save_folder(*folder);
 }
 
 // An empty path would name everything: it is refused wherever a tree is deleted.
@@ -61,6 +56,22 @@ int rename_folder(const DIR_INFO_REC* folder, const char* old_path) {
 constexpr int zero_unless_negative(int result) { return result < 0 ? -1 : 0; }
 
 }  // namespace
+
+std::optional<int> result_without_save(const DIR_INFO_REC& folder) {
+  if (!IsDirExist(folder.path)) {
+    kRequestLog.colon(kNoFolder, "Path should be a directory, not a file: %s", folder.path);
+    return -1;
+  }
+  if (!belongs(folder.path)) return 0;
+  return std::nullopt;
+}
+
+int save_folder(const DIR_INFO_REC& folder) {
+  if (DirInfoDBSave(&folder) == 0) return 0;
+  kRequestLog.colon(kNotSaved, "Failed to save dir info.");
+  return -1;
+}
+
 }  // namespace mediidx
 
 using mediidx::kRequestLog;

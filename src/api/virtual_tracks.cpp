@@ -7,9 +7,7 @@
 
 #include "mediidx/cue_sheet.h"
 #include "mediidx/database.h"
-#include "mediidx/playlist.h"
 #include "support/log.h"
-#include "support/owned.h"
 
 namespace mediidx {
 namespace {
@@ -17,23 +15,31 @@ namespace {
 constexpr int kNotParsed = 140;
 constexpr int kNotSaved = 141;
 
+}  // namespace
+
 bool is_cue_sheet(const char* path) {
   const char* extension = TAVOIndexExtGet(path);
   return extension && strcasecmp(extension, "cue") == 0;
 }
 
-}  // namespace
+std::optional<OwnedTracks> parse_virtual_tracks(const char* path) {
+  OwnedTracks tracks;
+  const int result = TAVOParseCueByPath(out(tracks), path);
+  if (result == 0) return tracks;
+  kRequestLog.colon(kNotParsed, "Failed to parse cue file");
+  return std::nullopt;
+}
+
+int virtual_tracks_not_saved() {
+  kRequestLog.colon(kNotSaved, "Failed to save shared virtual files");
+  return -1;
+}
 
 int add_virtual_tracks(__tag_TAVO_MEDIA_INFO& info, MEDIA_TABLE_TYPE type) {
   if (type != MEDIA_TABLE_PLAYLIST || !is_cue_sheet(info.path)) return 0;
-  Owned<_PLAYLIST_REC, TAVOPlaylistRecFree> tracks;
-  if (TAVOParseCueByPath(out(tracks), info.path) != 0) {
-    kRequestLog.colon(kNotParsed, "Failed to parse cue file");
-    return -1;
-  }
-  if (MediaInfoVirtualDBSave(tracks.get(), &info) >= 0) return 0;
-  kRequestLog.colon(kNotSaved, "Failed to save shared virtual files");
-  return -1;
+  const auto tracks = parse_virtual_tracks(info.path);
+  if (!tracks) return -1;
+  return MediaInfoVirtualDBSave(tracks->get(), &info) >= 0 ? 0 : virtual_tracks_not_saved();
 }
 
 }  // namespace mediidx

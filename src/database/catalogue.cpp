@@ -53,6 +53,10 @@ bool insert_tag_rows(const Connection& conn, const Record& info, int track_id) {
 
 }  // namespace
 
+void log_ratings_not_inserted() {
+  failed(kInsertRatingFailedLine, "Failed to insert rating data into rating_track table");
+}
+
 bool insert_track(const Connection& conn, Record& info, const Record* cue_sheet,
                   std::int64_t userid) {
   const bool is_virtual = cue_sheet != nullptr;
@@ -67,8 +71,9 @@ bool insert_track(const Connection& conn, Record& info, const Record* cue_sheet,
     return failed(kInsertVirtualInfoFailedLine,
                   "Failed to insert data into virtual_info_track table");
   }
-  return insert_rating_rows(conn, info, *track_id, is_virtual) ||
-         failed(kInsertRatingFailedLine, "Failed to insert rating data into rating_track table");
+  if (insert_rating_rows(conn, info, *track_id, is_virtual)) return true;
+  log_ratings_not_inserted();
+  return false;
 }
 
 bool update_track(const Connection& conn, const Record& info) {

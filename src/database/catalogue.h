@@ -21,6 +21,9 @@ bool update_track(const Connection& conn, const Record& info);
 /// Removes the genre, composer, artist and album rows of `info.id`, its album recovered first.
 bool delete_side_rows(const Connection& conn, const Record& info);
 
+/// Logs that a track has everything but its ratings.
+void log_ratings_not_inserted();
+
 }  // namespace mediidx::catalogue
 
 #endif

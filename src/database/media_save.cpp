@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 
 // Storing files, the transcoded copies of videos, and replay gain.
+#include "database/media_save.h"
+
 #include "database/playlist_count.h"
 #include "database/record.h"
 #include "database/session.h"
@@ -138,7 +140,7 @@ int save(MEDIA_TABLE_TYPE type, Info& info) {
   if (!handle) return -1;
   if (type == MEDIA_TABLE_MUSIC) {
     if (MediaDBInsertIntoTrackRelatedTables(handle->conn, &info, nullptr, 0, userid) < 0) {
-      kDatabaseLog.colon(kNotRelated, "Failed to insert data into track related tables");
+      log_song_not_related();
       return -1;
     }
     if (userid != 0) return 0;  // songs of a personal library live in the catalogue only
@@ -174,6 +176,11 @@ int save_replay_gain(const float* gains, std::uint32_t track_id) {
 }
 
 }  // namespace
+
+void log_song_not_related() {
+  kDatabaseLog.colon(kNotRelated, "Failed to insert data into track related tables");
+}
+
 }  // namespace mediidx
 
 using mediidx::kDatabaseLog;

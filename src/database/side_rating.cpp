@@ -46,11 +46,8 @@ bool user_exists(std::uint32_t uid) {
   return TAVOUserGetByUID(uid, out(user)) == 0;
 }
 
-void insert_rating_row(const Connection& conn, const char* user, const char* stars, int track_id) {
-  const auto uid = number_from<std::uint32_t>(user);
-  const auto star = number_from<int>(stars);
-  if (!uid || !star || !user_exists(*uid)) return;
-  const auto sql = conn.fill(kInsertRating, std::int64_t{*uid}, track_id, *star);
+void insert_rating_row(const Connection& conn, const Rating& rating, int track_id) {
+  const auto sql = conn.fill(kInsertRating, std::int64_t{rating.userid}, track_id, rating.star);
   if (conn.run_unlogged(sql)) return;
   kDatabaseLog.colon(kRatingInsertLine, "Failed to exec [%s] (%s).", sql ? sql.get() : "(null)",
                      conn.error());
@@ -58,20 +55,34 @@ void insert_rating_row(const Connection& conn, const char* user, const char* sta
 
 }  // namespace
 
-bool insert_rating_rows(const Connection& conn, const Record& info, int track_id, bool is_virtual) {
+std::optional<std::vector<Rating>> read_ratings(const Record& info, bool is_virtual) {
   const auto key = rating_key(info, is_virtual);
-  const OwnedHash ratings(TLIBCSzHashAlloc(1024));
-  if (!ratings) return failed(kRatingHashLine, "Failed to alloc memory");
-  if (TAVOMediaIndexGetAllUserDefinedSongRating(key.c_str(), ratings.get()) == 0) {
-    kDatabaseLog.colon(kRatingReadLine, "Failed to get song rating from path [%s]", key.c_str());
-    return false;
+  const OwnedHash found(TLIBCSzHashAlloc(1024));
+  if (!found) {
+    failed(kRatingHashLine, "Failed to alloc memory");
+    return std::nullopt;
   }
+  if (TAVOMediaIndexGetAllUserDefinedSongRating(key.c_str(), found.get()) == 0) {
+    kDatabaseLog.colon(kRatingReadLine, "Failed to get song rating from path [%s]", key.c_str());
+    return std::nullopt;
+  }
+  std::vector<Rating> ratings;
   int cursor = 0;
   const char* user = nullptr;
   const char* stars = nullptr;
-  while (TLIBCSzHashNext(ratings.get(), &cursor, &user, &stars) == 1) {
-    if (user && stars) insert_rating_row(conn, user, stars, track_id);
+  while (TLIBCSzHashNext(found.get(), &cursor, &user, &stars) == 1) {
+    if (!user || !stars) continue;
+    const auto uid = number_from<std::uint32_t>(user);
+    const auto star = number_from<int>(stars);
+    if (uid && star && user_exists(*uid)) ratings.push_back({*uid, *star});
   }
+  return ratings;
+}
+
+bool insert_rating_rows(const Connection& conn, const Record& info, int track_id, bool is_virtual) {
+  const auto ratings = read_ratings(info, is_virtual);
+  if (!ratings) return false;
+  for (const auto& rating : *ratings) insert_rating_row(conn, rating, track_id);
   return true;
 }
 

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 
 // Rows of the virtual tracks that a cue sheet cuts out of its audio files.
+#include "database/virtual_tracks.h"
+
 #include <string>
 
 #include "database/record.h"
@@ -48,13 +50,6 @@ int bad_parameter() {
   return -1;
 }
 
-/// Where the track begins and its cue sheet, by whose path the row is found again.
-std::string virtual_comment(const Info& info, const Info& cue) {
-  constexpr std::size_t kWidth = 254;
-  const auto whole = std::string(info.comment) + cue.path;
-  return std::string(cut_at_character(whole, kWidth));
-}
-
 bool insert_row(tavodb_connection* conn, const Info& info, Text comment) {
   const auto sql = fill(kDatabaseType, kInsert, info.path, info.title, info.album, info.artist,
                         info.album_artist, info.composer, info.year, info.genre, comment,
@@ -73,13 +68,13 @@ bool save_track(tavodb_connection* conn, Info& info, const Info& cue) {
   if (TAVOMediaIndexIsIndexPath(info.path, MEDIA_TABLE_MUSIC) <= 0) return true;
   if (userid == 0 && !insert_row(conn, info, comment.c_str())) return false;
   if (MediaDBInsertIntoTrackRelatedTables(conn, &info, &cue, 1, userid) >= 0) return true;
-  kDatabaseLog.colon(kNotRelated, "Failed to insert data into track related tables");
+  log_virtual_track_not_related();
   return false;
 }
 
 int save(_PLAYLIST_REC* list, Info* cue) {
   if (!list) {
-    kDatabaseLog.colon(kNoList, "Input list is NULL.");
+    log_no_virtual_tracks();
     return 0;  // kept: a cue sheet without tracks is no failure
   }
   if (!cue) return bad_parameter();
@@ -105,6 +100,19 @@ int delete_tracks(Text cue_path) {
 }
 
 }  // namespace
+
+std::string virtual_comment(const Info& info, const Info& cue) {
+  constexpr std::size_t kWidth = 254;
+  const auto whole = std::string(info.comment) + cue.path;
+  return std::string(cut_at_character(whole, kWidth));
+}
+
+void log_no_virtual_tracks() { kDatabaseLog.colon(kNoList, "Input list is NULL."); }
+
+void log_virtual_track_not_related() {
+  kDatabaseLog.colon(kNotRelated, "Failed to insert data into track related tables");
+}
+
 }  // namespace mediidx
 
 extern "C" int MediaInfoVirtualDBSave(_PLAYLIST_REC* list, __tag_TAVO_MEDIA_INFO* cueInfo) {

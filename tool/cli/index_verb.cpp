@@ -25,16 +25,29 @@ std::string count_line(const char* name, std::size_t count) {
   return line.data();
 }
 
-void print_summary(const ScanReport& report, const std::vector<std::string>& folders) {
+/// What the index holds of these folders now.
+void print_summary(Database& database, const ScanReport& report,
+                   const std::vector<std::string>& folders) {
   std::string out = report.is_stopped ? "Stopped indexing" : "Indexed";
-  for (const auto& folder : folders) out += " " + escape_for_display(folder);
+  ScanState::Holding all;
+  for (const auto& folder : folders) {
+    out += " " + escape_for_display(folder);
+    const auto holding = ScanState(database).holding(folder);
+    for (std::size_t kind = 0; kind < all.files.size(); ++kind) {
+      all.files[kind] += holding.files[kind];
+    }
+    all.folders += holding.folders;
+    all.left_alone += holding.left_alone;
+  }
   out += ":\n";
   for (std::size_t kind = 0; kind < kKindNames.size(); ++kind) {
-    out += count_line(kKindNames[kind], report.saved[kind]);
+    out += count_line(kKindNames[kind], static_cast<std::size_t>(all.files[kind]));
   }
-  out += count_line("folders", report.folders);
+  out += count_line("folders", static_cast<std::size_t>(all.folders));
   if (report.switched_off > 0) out += count_line("switched off", report.switched_off);
   out += count_line("failed", report.failed + report.unstorable);
+  const auto left_alone = static_cast<std::size_t>(all.left_alone);
+  if (left_alone > report.failed) out += count_line("left alone", left_alone);
   put(out);
 }
 
@@ -60,7 +73,7 @@ int run_index(const Arguments& arguments) {
   ScanSetting setting;
   setting.full_speed = arguments.has("--full-speed");
   const auto report = run_scanner(data, database, folders, setting);
-  print_summary(report, folders);
+  print_summary(database, report, folders);
   print_next_steps(database, arguments);
   put(scan_line(report, watch.seconds()));
   return exit_status(report);

@@ -52,18 +52,26 @@ constexpr const char* kChangeColumns =
     "SELECT id, what, root, folder, path, kind, known, size, modified, device, inode, source "
     "FROM scan.change ";
 
-/// Every file that the library holds below a folder, with its kind.
+/// Every file that the library holds below a folder, with its kind, some of them twice.
 std::string rows_of_library(const std::string& folder) {
   const auto below = " path ^@ " + literal(folder + "/");
   const std::string kind_of_list = "CASE WHEN path ILIKE '%.cue' THEN 4 ELSE 3 END";
   return "(SELECT path, 0 AS kind, userid <> 0 AS personal FROM track WHERE is_virtual = 'FALSE' "
          "AND" +
-         below + " UNION SELECT path, 0, false FROM music WHERE" + below +
-         " AND NOT EXISTS (SELECT 1 FROM track t WHERE t.path = music.path AND is_virtual = 'FALSE')"
-         " UNION SELECT path, 1, false FROM photo WHERE" +
-         below + " UNION SELECT path, 2, false FROM video WHERE" + below + " UNION SELECT path, " +
-         kind_of_list + ", false FROM playlist WHERE" + below + " UNION SELECT path, " +
+         below + " UNION ALL SELECT path, 0, false FROM music WHERE" + below +
+         " UNION ALL SELECT path, 1, false FROM photo WHERE" + below +
+         " UNION ALL SELECT path, 2, false FROM video WHERE" + below + " UNION ALL SELECT path, " +
+         kind_of_list + ", false FROM playlist WHERE" + below + " UNION ALL SELECT path, " +
          kind_of_list + ", true FROM personal_playlist WHERE" + below + ")";
+}
+
+/// Those of them that are not known here. A set operation, because the server, which knows nothing
+/// of how often joined paths occur, would join them row by row.
+std::string unknown_paths(const std::string& folder) {
+  return "(SELECT path FROM " + rows_of_library(folder) +
+         " r EXCEPT SELECT f.path || '/' || x.name FROM scan.file x JOIN scan.folder f "
+         "ON x.folder = f.id WHERE " +
+         in_folder(folder) + ")";
 }
 
 // Audio files whose rows go or are replaced.
@@ -142,6 +150,26 @@ std::int64_t ScanState::count_files(const std::string& folder) {
   return rows.next() ? rows.number("files") : 0;
 }
 
+ScanState::Holding ScanState::holding(const std::string& folder) {
+  Holding out;
+  auto files = database_.query(
+      "SELECT x.kind, x.failure IS NULL AS is_held, count(*) AS files FROM scan.file x "
+      "JOIN scan.folder f ON x.folder = f.id WHERE x.size <> -1 AND " +
+      in_folder(folder) + " GROUP BY 1, 2");
+  while (files.next()) {
+    const auto count = files.number("files");
+    if (files.flag("is_held")) {
+      out.files.at(static_cast<std::size_t>(files.number("kind"))) = count;
+    } else {
+      out.left_alone += count;
+    }
+  }
+  auto folders = database_.query("SELECT count(f.modified) AS folders FROM scan.folder f WHERE " +
+                                 in_folder(folder));
+  if (folders.next()) out.folders = folders.number("folders");
+  return out;
+}
+
 bool ScanState::holds_anything(const std::string& folder) {
   const auto below = literal(folder + "/");
   auto folders =
@@ -184,24 +212,26 @@ void ScanState::mark_lost(const std::string& folder) {
 }
 
 void ScanState::take_up(const std::string& folder) {
-  const auto unknown = "FROM " + rows_of_library(folder) +
-                       " r WHERE NOT EXISTS (SELECT 1 FROM scan.file x JOIN scan.folder f "
-                       "ON x.folder = f.id WHERE f.path || '/' || x.name = r.path)";
-  const std::string parent_of_row = "regexp_replace(r.path, '/[^/]*$', '')";
-  auto any = database_.query("SELECT 1 AS one " + unknown + " LIMIT 1");
+  const auto unknown = unknown_paths(folder);
   int taken = 0;
-  if (any.next()) {
+  if (database_.query("SELECT 1 AS one FROM " + unknown + " u LIMIT 1").next()) {
+    // A song has a row in two tables: of a personal one, its own.
+    const auto rows =
+        "(SELECT path, min(kind) AS kind, bool_or(personal) AS personal, "
+        "regexp_replace(path, '/[^/]*$', '') AS parent FROM " +
+        rows_of_library(folder) + " r WHERE path IN (SELECT path FROM " + unknown +
+        " u) GROUP BY path)";
     taken = database_.run(
-        "INSERT INTO scan.folder(path, parent, personal) SELECT DISTINCT ON (n.path) n.path, "
-        "regexp_replace(n.path, '/[^/]*$', ''), n.personal FROM (SELECT " +
-        parent_of_row + " AS path, r.personal " + unknown +
-        ") n WHERE NOT EXISTS (SELECT 1 FROM scan.folder f WHERE f.path = n.path)");
+        "INSERT INTO scan.folder(path, parent, personal) SELECT n.parent, "
+        "regexp_replace(n.parent, '/[^/]*$', ''), bool_or(n.personal) FROM " +
+        rows +
+        " n WHERE NOT EXISTS (SELECT 1 FROM scan.folder f WHERE f.path = n.parent) "
+        "GROUP BY n.parent");
     database_.run(
         "INSERT INTO scan.file(folder, name, kind, size, modified, device, inode) "
-        "SELECT at.id, regexp_replace(n.path, '^.*/', ''), n.kind, -2, 0, 0, 0 FROM "
-        "(SELECT r.path, r.kind, " +
-        parent_of_row + " AS parent " + unknown +
-        ") n JOIN scan.folder at ON at.path = n.parent "
+        "SELECT at.id, regexp_replace(n.path, '^.*/', ''), n.kind, -2, 0, 0, 0 FROM " +
+        rows +
+        " n JOIN scan.folder at ON at.path = n.parent "
         "WHERE octet_length(n.path) - octet_length(n.parent) <= 256 ON CONFLICT DO NOTHING");
   }
   for (const char* table : {"directory", "personal_directory"}) {
@@ -483,6 +513,12 @@ void ScanState::mark_unsure(int folder, const std::string& name) {
 
 void ScanState::unsettle_below(const std::string& folder) {
   const auto below = " ^@ " + literal(folder + "/");
+  // The tracks that sheets elsewhere cut out of its files go too.
+  database_.run(
+      "UPDATE scan.file x SET size = -2 FROM scan.folder f WHERE x.folder = f.id AND x.kind = 4 "
+      "AND x.failure IS NULL AND f.path || '/' || x.name IN (SELECT v.cue_sheet_path "
+      "FROM virtual_info_track v JOIN track t ON t.id = v.track WHERE t.path" +
+      below + ")");
   database_.run(
       "INSERT INTO scan.unsettled(what, name) "
       "SELECT 0, a.album FROM track t JOIN album_track a ON a.track = t.id "

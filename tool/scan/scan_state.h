@@ -5,6 +5,7 @@
 #ifndef MEDIIDX_TOOL_SCAN_SCAN_STATE_H_
 #define MEDIIDX_TOOL_SCAN_SCAN_STATE_H_
 
+#include <array>
 #include <cstdint>
 #include <map>
 #include <optional>
@@ -110,6 +111,13 @@ class ScanState {
   void set_root(int id, const std::string& volume, bool away);
   /// Files in the index below a folder.
   std::int64_t count_files(const std::string& folder);
+  /// What is in the index at and below a folder; of files, by kind.
+  struct Holding {
+    std::array<std::int64_t, kKinds> files{};
+    std::int64_t folders = 0;
+    std::int64_t left_alone = 0;  ///< Files that are not, because they failed.
+  };
+  Holding holding(const std::string& folder);
   /// Whether the index holds a file or a folder below a folder.
   bool holds_anything(const std::string& folder);
 

@@ -393,13 +393,14 @@ void Scanner::write_batch() {
 void Scanner::write_alone(const Ready& ready) {
   const auto& change = ready.change;
   if (change.folder != 0) state_.mark_unsure(change.folder, name_of(change.path));
+  const bool is_saved = save(ready);
   auto state = state_of(ready);
-  if (save(ready)) {
+  if (is_saved) {
     count_saved(ready);
   } else {
     const auto reason = fail_in_database(change);
-    // A sheet's text will not do better next time.
-    if (change.kind != Kind::kCueSheet) return;
+    // A sheet's text will not do better next time, unless it went away meanwhile.
+    if (change.kind != Kind::kCueSheet || state.status.size < 0) return;
     state.failure = reason;
   }
   state_.save({&state, 1});
@@ -443,7 +444,10 @@ FileState Scanner::state_of(const Ready& ready) const {
   const auto& before = answer.before;
   out.status.size = before.size;
   out.status.modified = before.seconds * 1'000'000'000 + before.nanoseconds;
-  const bool is_settled = before == answer.after && std::abs(now() - out.status.modified) > kTick;
+  // The library reads a list itself, after the look at it.
+  const bool is_list = change.kind == Kind::kPlaylist || change.kind == Kind::kCueSheet;
+  const bool is_settled = before == (is_list ? stamp_of(change.path) : answer.after) &&
+                          std::abs(now() - out.status.modified) > kTick;
   if (!is_settled) out.status.size = -2;
   return out;
 }

@@ -44,9 +44,10 @@ std::string text_of(const Exiv2::Metadatum& datum) {
   return clean_text(decode_legacy(titles ? titles->toString("x-default") : datum.toString()));
 }
 
+/// Not a number for what is divided by 0, as cameras write what they do not know.
 double number_of(const Exiv2::Metadatum& datum) {
   const auto [numerator, denominator] = datum.toRational();
-  return denominator == 0 ? 0 : static_cast<double>(numerator) / denominator;
+  return denominator == 0 ? std::nan("") : static_cast<double>(numerator) / denominator;
 }
 
 std::string time_of(const Exiv2::Metadatum& datum) { return camera_time(text_of(datum)); }
@@ -73,7 +74,7 @@ void store_iso(const Exiv2::Image& image, MediaFile& file) {
 /// The size that the tags tell, where the image does not.
 int size_of(const Exiv2::Image& image, int pixels, const char* key) {
   const auto* datum = pixels > 0 ? nullptr : find(image, key);
-  return datum ? to_int(std::lround(number_of(*datum))) : pixels;
+  return datum ? to_int(datum->toLong()) : pixels;
 }
 
 /// Turned as the picture is to be shown.

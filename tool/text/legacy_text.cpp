@@ -5,6 +5,7 @@
 #include <tavocore.h>
 #include <tavoindex.h>
 
+#include <algorithm>
 #include <optional>
 
 #include "text/utf8.h"

@@ -416,6 +416,9 @@ def photos():
         photo(f"exposure-{name}.jpg", [f"Exif.Photo.ExposureTime Rational {value}"])
     photo("powers.jpg", ["Exif.Photo.ShutterSpeedValue SRational 7/1",
                          "Exif.Photo.ApertureValue Rational 3/1"])
+    photo("unknown.jpg", ["Exif.Photo.ShutterSpeedValue SRational 0/0",
+                          "Exif.Photo.ApertureValue Rational 0/0",
+                          "Exif.Photo.FNumber Rational 0/0"])
     photo("whole-aperture.jpg", ["Exif.Photo.FNumber Rational 8/1"])
     photo("xmp.jpg", ["Xmp.exif.DateTimeOriginal 2020-02-29T23:59:58+09:00",
                       "Xmp.tiff.Make Lumen", "Xmp.exif.ExposureTime 1/60", "Xmp.exif.FNumber 4/1"])

@@ -79,6 +79,12 @@ TEST(Settings, AreReadFromPowersOfTwo) {
   EXPECT_EQ(file.aperture, "f/2.8");
 }
 
+TEST(Settings, DividedByZeroAreNone) {
+  const auto file = read_sample("photos/unknown.jpg");
+  EXPECT_EQ(file.exposure, "");
+  EXPECT_EQ(file.aperture, "");
+}
+
 TEST(Settings, AreReadFromXmpToo) {
   const auto file = read_sample("photos/xmp.jpg");
   EXPECT_EQ(file.timetaken, "2020-02-29 23:59:58");

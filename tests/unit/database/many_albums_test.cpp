@@ -116,7 +116,7 @@ class Replays : public testing::TestWithParam<bool> {
     AlbumModel::Tags tags;
   };
 
-  unsigned below(unsigned n) { return static_cast<unsigned>(random_() % n); }
+  unsigned below(unsigned n) { return static_cast<unsigned>(random() % n); }
   std::string path() { return std::string("/") + "abcd"[below(4)]; }
   std::string sheet() { return std::string("/") + "xyz"[below(3)]; }
   AlbumModel::Tags tags() {
@@ -154,7 +154,7 @@ class Replays : public testing::TestWithParam<bool> {
     return albums;
   }
 
-  std::mt19937 random_{7};
+  std::mt19937 random{7};
 };
 
 TEST_P(Replays, GiveWhatTheRulesGive) {

@@ -81,12 +81,11 @@ try newer_than scan/compare.cpp \
   's/std::abs(before.modified - now.modified) <=/now.modified - before.modified <=/'
 try gone_files_stay scan/compare.cpp 's/return remove_file(file, What::kGone);/return;/'
 try gone_folders_stay scan/compare.cpp 's/add_lost_folder(path, What::kGoneFolder);/;/'
-try empty_is_there scan/scanner_looks.cpp 's/is_empty_folder(start.root)/start.root.empty()/'
+try empty_is_there scan/scanner_looks.cpp 's/is_empty_folder(root.path)/root.path.empty()/'
 try damaged_keeps_rows scan/scanner.cpp \
   's/^  return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;/  return true;/'
-try stays_offline scan/scanner_looks.cpp 's/^  bring_online(start.root);$//'
-try neighbours_go_offline scan/scanner_looks.cpp \
-  's/MediaInfoDBSetOnline((folder + "\/").c_str(), 1, 0)/MediaInfoDBSetOnline(folder.c_str(), 1, 0)/'
+try stays_offline scan/scanner_looks.cpp 's/^      bring_online(path);$//'
+try marks_stay scan/scanner.cpp 's/^  state_.plan_unmarked_audio();$//'
 try sheets_keep_old_audio scan/scan_state.cpp \
   's/^const std::string kChangedAudio = ".*";$/const std::string kChangedAudio = "(SELECT path FROM scan.change WHERE false)";/'
 try albums_keep_history scan/scanner.cpp 's/if (!state_.has_unsettled()) return;/return;/'

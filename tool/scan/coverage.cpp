@@ -37,11 +37,11 @@ std::vector<std::string> outermost_index_folders() {
 Coverage coverage_of(const std::string& folder) {
   Coverage out;
   const auto file = folder + "/x";
-  for (const auto kind :
-       {Kind::kMusic, Kind::kPhoto, Kind::kVideo, Kind::kPlaylist, Kind::kCueSheet}) {
+  for (const auto kind : {Kind::kMusic, Kind::kPhoto, Kind::kVideo, Kind::kPlaylist}) {
     out.kinds[static_cast<std::size_t>(kind)] =
         TAVOMediaIndexIsIndexPath(file.c_str(), table_of(kind)) > 0;
   }
+  out.kinds[static_cast<std::size_t>(Kind::kCueSheet)] = out.wants(Kind::kPlaylist);
   out.folder = TAVOMediaIndexIsIndexPath(folder.c_str(), MEDIA_TABLE_DIRECTORY) > 0;
   out.personal = TAVOMediaIndexGetUserIdFromPath(file.c_str()) != 0;
   return out;

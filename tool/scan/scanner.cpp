@@ -210,8 +210,8 @@ void Scanner::apply() {
 void Scanner::roll_back() {
   try {
     database_.run("ROLLBACK");
-  } catch (const std::runtime_error&) {
-    // There is nothing to be undone where there is no connection.
+  } catch (const std::runtime_error& error) {
+    throw DatabaseLost(error.what());
   }
   check_connection();
 }

@@ -85,7 +85,8 @@ try empty_is_there scan/scanner_looks.cpp 's/is_empty_folder(root.path)/root.pat
 try damaged_keeps_rows scan/scanner.cpp \
   's/^  return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;/  return true;/'
 try stays_offline scan/scanner_looks.cpp 's/^      bring_online(path);$//'
-try marks_stay scan/scanner.cpp 's/^  state_.plan_unmarked_audio();$//'
+try folders_stay_old scan/compare.cpp \
+  's/\*known_.modified != now.modified/now.modified < 0/'
 try sheets_keep_old_audio scan/scan_state.cpp \
   's/^const std::string kChangedAudio = ".*";$/const std::string kChangedAudio = "(SELECT path FROM scan.change WHERE false)";/'
 try albums_keep_history scan/scanner.cpp 's/if (!state_.has_unsettled()) return;/return;/'

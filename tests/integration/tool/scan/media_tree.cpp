@@ -430,7 +430,8 @@ std::string MediaTree::open_all() {
   // Those of roots that are away wait for them.
   std::string what;
   for (auto path = closed_.begin(); path != closed_.end();) {
-    if (fs::exists(*path)) {
+    std::error_code ignored;
+    if (fs::exists(*path, ignored)) {
       fs::permissions(*path, fs::perms(fs::is_directory(*path) ? 0755 : 0644));
       what += "open " + *path + " ";
       path = closed_.erase(path);

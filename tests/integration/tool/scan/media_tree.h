@@ -30,7 +30,11 @@ class MediaTree {
   bool is_away(const std::string& root) const { return away_.contains(root); }
   /// Any folder that is there, a root or one below.
   std::string any_folder();
-  bool is_there(const std::string& folder) const { return std::filesystem::is_directory(folder); }
+  /// A folder that can be looked at: not one below a folder that is closed.
+  bool is_there(const std::string& folder) const {
+    std::error_code ignored;
+    return std::filesystem::is_directory(folder, ignored);
+  }
   std::string any_file();
   /// True when a folder above the path, or it, is closed.
   bool is_closed(const std::string& path) const;

@@ -225,7 +225,7 @@ TEST_F(UnreadableThings, FolderFreezesWhatIsBelowIt) {
 TEST_F(UnreadableThings, FolderThatMayOnlyBeListedFreezesWhatIsInIt) {
   song("closed/a.mp3", {.title = "Frozen"});
   start();
-  ASSERT_EQ(chmod(at("closed").c_str(), 0744), 0);
+  ASSERT_EQ(chmod(at("closed").c_str(), 0444), 0);
   const auto done = scan({}, setting);
   EXPECT_EQ(done.status, 3);
   EXPECT_THAT(done.err, HasSubstr("not indexed: " + at("closed/a.mp3") + ": Permission denied"));

@@ -407,10 +407,13 @@ void ScanState::find_consequences() {
   database_.run(
       "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, device, "
       "inode) SELECT 4, 2, 0, f.id, f.path || '/' || x.name, 4, x.size, x.size, x.modified, "
-      "x.device, x.inode FROM (SELECT DISTINCT v.cue_sheet_path AS path FROM " +
+      "x.device, x.inode FROM (SELECT v.cue_sheet_path AS path FROM " +
       kChangedAudio +
       " a JOIN track t ON t.path = a.path AND t.is_virtual = 'TRUE' "
-      "JOIN virtual_info_track v ON v.track = t.id) s "
+      "JOIN virtual_info_track v ON v.track = t.id "
+      "UNION SELECT f.path || '/' || x.name FROM scan.change a JOIN scan.folder f ON f.id = a.folder "
+      "JOIN scan.file x ON x.folder = f.id WHERE a.kind = 0 AND x.kind = 4 "
+      "AND x.failure IS NULL) s "
       "JOIN scan.folder f ON f.path = regexp_replace(s.path, '/[^/]*$', '') "
       "JOIN scan.file x ON x.folder = f.id AND x.name = regexp_replace(s.path, '^.*/', '') "
       "WHERE x.kind = 4 AND NOT EXISTS (SELECT 1 FROM scan.change c WHERE c.path = s.path)");

@@ -162,10 +162,8 @@ void FileWalk::read_rules(const std::string& folder) {
   if (!text.empty()) rules_.add(folder, text);
 }
 
-void FileWalk::start_rules(const std::string& root) { rules_ = IgnoreRules(root); }
-
 bool FileWalk::is_left_out(const std::string& root, const std::string& folder) {
-  start_rules(root);
+  rules_ = IgnoreRules(root);
   for (auto at = root.size(); at < folder.size();) {
     const auto parent = folder.substr(0, at);
     const auto end = std::min(folder.find('/', at + 1), folder.size());

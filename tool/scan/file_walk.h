@@ -102,14 +102,12 @@ class FileWalk {
 
   bool enter(const std::string& folder, const struct stat& status, bool through_link);
   void list(FoundFolder& folder, const Listing& names, const struct stat& status);
-  void take_entry(FoundFolder& folder, const std::string& name, const struct stat& status);
   void take_file(FoundFolder& folder, const std::string& name, const struct stat& status,
                  bool through_link);
   void take_subfolder(FoundFolder& folder, const std::string& name, const struct stat& own,
                       const struct stat& status, bool through_link);
   void follow(FoundFolder& folder, const std::string& name, const struct stat& own);
   void read_rules(const std::string& folder);
-  void start_rules(const std::string& root);
   bool is_storable(const std::string& path);
   bool lies_in_root(const std::string& real) const;
 

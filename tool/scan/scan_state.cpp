@@ -184,7 +184,7 @@ void ScanState::reconcile(const std::string& folder) {
 
 void ScanState::mark_lost(const std::string& folder) {
   struct Held {
-    const char* files;
+    const char* files;  ///< Or folders, of one table.
     const char* table;
   };
   constexpr Held kHeld[] = {
@@ -201,13 +201,14 @@ void ScanState::mark_lost(const std::string& folder) {
                   " AND NOT EXISTS (SELECT 1 FROM " + held.table +
                   " h.path = f.path || '/' || x.name)");
   }
-  for (const char* table :
-       {"directory h WHERE NOT f.personal AND", "personal_directory h WHERE f.personal AND"}) {
-    const std::string personal =
-        std::string(table).starts_with("p") ? "f.personal" : "NOT f.personal";
+  constexpr Held kFolders[] = {
+      {"NOT f.personal", "directory h WHERE"},
+      {"f.personal", "personal_directory h WHERE"},
+  };
+  for (const auto& held : kFolders) {
     database_.run("UPDATE scan.folder f SET modified = NULL WHERE " + in_folder(folder) +
-                  " AND f.modified IS NOT NULL AND " + personal +
-                  " AND NOT EXISTS (SELECT 1 FROM " + table + " h.path = f.path)");
+                  " AND f.modified IS NOT NULL AND " + held.files +
+                  " AND NOT EXISTS (SELECT 1 FROM " + held.table + " h.path = f.path)");
   }
 }
 

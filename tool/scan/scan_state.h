@@ -127,7 +127,6 @@ class ScanState {
   /// What is known of these folders, by path; the others get an id.
   std::map<std::string, KnownFolder> look_up(std::span<const ListedFolder> folders);
   void set_folder(int id, bool mounted, bool away, std::optional<std::int64_t> modified);
-  std::vector<std::string> away_folders(const std::string& folder);
 
   /* The plan */
 

@@ -12,10 +12,11 @@
 #include <charconv>
 #include <chrono>
 #include <fstream>
-#include <iterator>
+#include <sstream>
 #include <stdexcept>
 #include <system_error>
 #include <thread>
+#include <utility>
 
 namespace mediidx::tool {
 namespace {
@@ -31,9 +32,12 @@ constexpr std::size_t kLongestSocketFolder = 107 - 14;
 
 bool is_alive(pid_t pid) { return kill(pid, 0) == 0 || errno == EPERM; }
 
+/// Empty for what cannot be read, which a process that ends meanwhile makes of its own files: an
+/// iterator over the stream's buffer would throw then.
 std::string read_file(const fs::path& file) {
-  std::ifstream in(file, std::ios::binary);
-  return {std::istreambuf_iterator<char>(in), {}};
+  std::ostringstream out;
+  out << std::ifstream(file, std::ios::binary).rdbuf();
+  return std::move(out).str();
 }
 
 /// A lock file that a crash left may hold the id of a process that lives now, and a server of the

@@ -15,7 +15,6 @@
 #include <charconv>
 #include <cstdlib>
 #include <fstream>
-#include <iterator>
 #include <stdexcept>
 #include <thread>
 #include <utility>
@@ -96,8 +95,16 @@ Outcome run_mediidx(const std::vector<std::string>& arguments, const Setting& se
   close(out.ends[1]);
   close(err.ends[1]);
   Outcome run;
-  std::thread errors([&] { run.err = read_all(err.ends[0]); });
-  if (setting.meanwhile) setting.meanwhile(child);
+  std::jthread errors([&] { run.err = read_all(err.ends[0]); });
+  try {
+    if (setting.meanwhile) setting.meanwhile(child);
+  } catch (...) {
+    // Nobody reads the command's output any more: it must not wait for that.
+    kill(child, SIGKILL);
+    exit_status(child);
+    close(out.ends[0]);
+    throw;
+  }
   run.out = read_all(out.ends[0]);
   errors.join();
   run.status = exit_status(child);
@@ -152,8 +159,10 @@ std::vector<pid_t> processes_with(const std::string& argument) {
     pid_t pid = 0;
     std::from_chars(name.data(), name.data() + name.size(), pid);
     if (pid <= 0) continue;
-    std::ifstream in(entry.path() / "cmdline", std::ios::binary);
-    const std::string words(std::istreambuf_iterator<char>(in), {});
+    // Not by a stream buffer: it throws when the process ends between opening and reading.
+    const int file = open((entry.path() / "cmdline").c_str(), O_RDONLY | O_CLOEXEC);
+    if (file < 0) continue;
+    const auto words = read_all(file);
     const auto wanted = '\0' + argument + '\0';
     if (words.find(wanted) != std::string::npos) found.push_back(pid);
   }

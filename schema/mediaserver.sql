@@ -358,6 +358,7 @@ CREATE INDEX IF NOT EXISTS folder_parent ON scan.folder USING spgist (parent);
 -- Files, by the name in their folder. "kind" counts music, photo, video, playlist, cue sheet from 0.
 -- A "size" below 0 is that of a file that has to be read again: -1 without rows in the index, -2
 -- with some. A file with a "failure" is left alone until it changes; only a cue sheet has a row then.
+-- "tracks": how many a cue sheet cut, counted at the end of the scan that read it.
 CREATE TABLE IF NOT EXISTS scan.file (
   folder integer NOT NULL REFERENCES scan.folder (id) ON DELETE CASCADE,
   name text NOT NULL,
@@ -367,8 +368,11 @@ CREATE TABLE IF NOT EXISTS scan.file (
   device bigint NOT NULL,
   inode bigint NOT NULL,
   failure text,
+  tracks integer,
   PRIMARY KEY (folder, name)
 );
+ALTER TABLE scan.file ADD COLUMN IF NOT EXISTS tracks integer;
+CREATE INDEX IF NOT EXISTS file_uncounted ON scan.file (folder) WHERE kind = 4 AND tracks IS NULL;
 
 -- What a scan found to be done, in "step" and "id" order. Lost with a crash: the next scan looks again.
 CREATE UNLOGGED TABLE IF NOT EXISTS scan.change (
@@ -395,4 +399,4 @@ CREATE TABLE IF NOT EXISTS scan.unsettled (
   name text NOT NULL
 );
 
-INSERT INTO mediidx.schema_version (version) VALUES (1), (2) ON CONFLICT DO NOTHING;
+INSERT INTO mediidx.schema_version (version) VALUES (1), (2), (3) ON CONFLICT DO NOTHING;

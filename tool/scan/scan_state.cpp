@@ -74,6 +74,9 @@ std::string unknown_paths(const std::string& folder) {
          in_folder(folder) + ")";
 }
 
+// Of the file "x" of the folder "f".
+const std::string kTracksOfSheet =
+    "(SELECT count(*) FROM virtual_info_track v WHERE v.cue_sheet_path = f.path || '/' || x.name)";
 // Audio files whose rows go or are replaced.
 const std::string kTouchedAudio =
     "(SELECT path FROM scan.change WHERE kind = 0 AND what IN (1, 2, 4, 5, 6, 9))";
@@ -98,6 +101,12 @@ void ScanState::take_right(bool wait) {
       number(kScanRight));
   throw AlreadyRunning("a scan is already running: " +
                        (rows.next() ? rows.text("name") : "in another session"));
+}
+
+void ScanState::count_tracks() {
+  database_.run("UPDATE scan.file x SET tracks = " + kTracksOfSheet +
+                " FROM scan.folder f WHERE x.folder = f.id AND x.kind = 4 AND x.tracks IS NULL "
+                "AND x.size >= 0 AND x.failure IS NULL");
 }
 
 void ScanState::end() { database_.query("SELECT pg_advisory_unlock(" + number(kScanRight) + ")"); }
@@ -201,6 +210,11 @@ void ScanState::mark_lost(const std::string& folder) {
                   " AND NOT EXISTS (SELECT 1 FROM " + held.table +
                   " h.path = f.path || '/' || x.name)");
   }
+  // A sheet whose tracks are gone has its row still.
+  database_.run("UPDATE scan.file x SET size = -2 FROM scan.folder f WHERE x.folder = f.id AND " +
+                in_folder(folder) +
+                " AND x.kind = 4 AND x.size >= 0 AND x.failure IS NULL AND x.tracks > " +
+                kTracksOfSheet);
   constexpr Held kFolders[] = {
       {"NOT f.personal", "directory h WHERE"},
       {"f.personal", "personal_directory h WHERE"},
@@ -488,7 +502,7 @@ void ScanState::save(std::span<const FileState> files) {
         values +
         " ON CONFLICT (folder, name) DO UPDATE SET kind = excluded.kind, size = excluded.size, "
         "modified = excluded.modified, device = excluded.device, inode = excluded.inode, "
-        "failure = excluded.failure");
+        "failure = excluded.failure, tracks = NULL");
   });
 }
 

@@ -158,6 +158,8 @@ class ScanState {
   void forget_folder(const std::string& path);
   /// Whatever happens to the file in hand, it will be read again.
   void mark_unsure(int folder, const std::string& name);
+  /// Notes how many tracks the sheets that were saved have by now, to miss them when they are gone.
+  void count_tracks();
 
   /* Settling */
 

@@ -182,6 +182,7 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
   }
   if (!stops()) apply();
   if (!stops()) settle();
+  if (!stops()) state_.count_tracks();
   state_.end();
 }
 

@@ -8,7 +8,7 @@
 namespace mediidx::tool {
 
 /// The version of the schema that this program works with.
-inline constexpr int kSchemaVersion = 2;
+inline constexpr int kSchemaVersion = 3;
 
 extern const char* const kSchemaText;
 

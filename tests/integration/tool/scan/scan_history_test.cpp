@@ -137,6 +137,19 @@ TEST_F(History, OfAFolderWithAudioOfASheetElsewhereKeepsItsTracks) {
   expect_as_fresh();
 }
 
+TEST_F(History, OfTracksThatSomebodyElseDeletedIsMissedByASheetFarFromItsAudio) {
+  song("audio/a.mp3");
+  write_sheet("sheets/a.cue", "../audio/a.mp3", "X", "Cut");
+  index();
+  for (const char* which : {"is_virtual = 'TRUE'", "true"}) {
+    rows(std::string("DELETE FROM track WHERE ") + which);
+    EXPECT_EQ(scan().status, 0);
+    EXPECT_EQ(count("track", "is_virtual = 'TRUE'"), 2);
+    expect_as_fresh();
+    expect_scan(0, {});
+  }
+}
+
 TEST_F(History, OfAlbumsThatASheetTiesTogetherIsForgotten) {
   song("a.mp3", {"A", "Hits", "X", "Tagged"});
   song("b.mp3", {"B", "Hits", "Y", ""});

@@ -15,19 +15,27 @@
 namespace mediidx::many {
 namespace {
 
-// Of albums that files leave, and that may recover then, all rows count; of the others, whether
-// they are collapsed, and whom they follow.
+// Of albums that files leave, and that may recover then, the rows of these files count, and of all
+// others whether their artists differ: of a huge album, a few rows tell that. Of the other albums,
+// whether they are collapsed, and whom they follow.
 constexpr const char* kSelectAlbums =
     "WITH losing AS (SELECT unnest($3::text[]) AS name "
     "UNION SELECT album FROM track JOIN album_track ON album_track.track = track.id "
     "WHERE path = ANY($1::text[]) AND is_virtual = 'FALSE'), "
-    "growing AS (SELECT unnest($2::text[]) AS name EXCEPT SELECT name FROM losing) "
-    "SELECT DISTINCT album, album_artist, from_album_artist, artist, "
-    "CASE WHEN path = ANY($1::text[]) THEN path END AS file, "
-    "is_virtual = 'FALSE' AS leaves, true AS counts "
+    "growing AS (SELECT unnest($2::text[]) AS name EXCEPT SELECT name FROM losing), "
+    "lost AS (SELECT album, from_album_artist, artist, "
+    "CASE WHEN from_album_artist = 'TRUE' AND album_artist <> '' THEN 'tagged' "
+    "ELSE album_artist END AS album_artist, "
+    "CASE WHEN path = ANY($1::text[]) THEN path END AS file, is_virtual = 'FALSE' AS leaves "
     "FROM losing JOIN album_track ON album = name "
     "LEFT JOIN track ON track.id = album_track.track "
-    "LEFT JOIN artist_track ON artist_track.track = album_track.track "
+    "LEFT JOIN artist_track ON artist_track.track = album_track.track) "
+    "SELECT album, album_artist, from_album_artist, artist, file, leaves, true AS counts "
+    "FROM lost WHERE file IS NOT NULL "
+    "UNION ALL SELECT album, album_artist, from_album_artist, unnest(ARRAY[min(artist), "
+    "max(artist)] || CASE WHEN bool_or(artist IS NULL) THEN ARRAY[NULL::text] END), "
+    "NULL, false, true FROM lost WHERE file IS NULL "
+    "GROUP BY album, album_artist, from_album_artist "
     "UNION ALL SELECT name, '', 'TRUE', NULL, NULL, false, true FROM growing "
     "WHERE EXISTS (SELECT 1 FROM album_track "
     "WHERE album = name AND album_artist = '' AND from_album_artist = 'TRUE') "

@@ -88,7 +88,7 @@ try stays_offline scan/scanner_looks.cpp 's/^      bring_online(path);$//'
 try folders_stay_old scan/compare.cpp \
   's/\*known_.modified != now.modified/now.modified < 0/'
 try sheets_keep_old_audio scan/scan_state.cpp \
-  's/^const std::string kChangedAudio = ".*";$/const std::string kChangedAudio = "(SELECT path FROM scan.change WHERE false)";/'
+  's/^const std::string kChangedAudio = ".*";$/const std::string kChangedAudio = "(SELECT path, folder FROM scan.change WHERE false)";/'
 try albums_keep_history scan/scanner.cpp 's/if (!state_.has_unsettled()) return;/return;/'
 try lost_rows_stay_lost scan/scan_state.cpp 's/^  mark_lost(folder);$//'
 

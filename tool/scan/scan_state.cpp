@@ -81,7 +81,7 @@ const std::string kTracksOfSheet =
 const std::string kTouchedAudio =
     "(SELECT path FROM scan.change WHERE kind = 0 AND what IN (1, 2, 4, 5, 6, 9))";
 // Audio files that come, change or go, under each of their names.
-const std::string kChangedAudio = "(SELECT path FROM scan.change WHERE kind = 0)";
+const std::string kChangedAudio = "(SELECT path, folder FROM scan.change WHERE kind = 0)";
 const std::string kTouchedSheets =
     "(SELECT path FROM scan.change WHERE kind = 4 AND what IN (1, 2, 4, 5, 6, 9))";
 
@@ -426,9 +426,10 @@ void ScanState::find_consequences() {
       kChangedAudio +
       " a JOIN track t ON t.path = a.path AND t.is_virtual = 'TRUE' "
       "JOIN virtual_info_track v ON v.track = t.id "
-      "UNION SELECT f.path || '/' || x.name FROM scan.change a JOIN scan.folder f ON f.id = a.folder "
-      "JOIN scan.file x ON x.folder = f.id WHERE a.kind = 0 AND x.kind = 4 "
-      "AND x.failure IS NULL) s "
+      "UNION SELECT f.path || '/' || x.name FROM " +
+      kChangedAudio +
+      " a JOIN scan.folder f ON f.id = a.folder JOIN scan.file x ON x.folder = f.id "
+      "WHERE x.kind = 4 AND x.failure IS NULL) s "
       "JOIN scan.folder f ON f.path = regexp_replace(s.path, '/[^/]*$', '') "
       "JOIN scan.file x ON x.folder = f.id AND x.name = regexp_replace(s.path, '^.*/', '') "
       "WHERE x.kind = 4 AND NOT EXISTS (SELECT 1 FROM scan.change c WHERE c.path = s.path)");

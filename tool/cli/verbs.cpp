@@ -7,6 +7,7 @@
 #include <exception>
 #include <limits>
 
+#include "cli/completion.h"
 #include "cli/interrupt.h"
 #include "cli/output.h"
 #include "store/database.h"
@@ -111,6 +112,13 @@ int run_help(const Arguments& arguments) {
 
 int run_version(const Arguments&) {
   put("mediidx " MEDIIDX_VERSION "\n");
+  return kExitDone;
+}
+
+constexpr const char* kShells[] = {"bash", "zsh"};
+
+int run_completion(const Arguments& arguments) {
+  put(arguments.operands[0] == "bash" ? bash_completion(verbs()) : zsh_completion(verbs()));
   return kExitDone;
 }
 
@@ -351,6 +359,14 @@ const Verb kVerbs[] = {
      {},
      run_rating_export,
      "0 done, 1 failed, 2 wrong usage, 3 done except for some files"},
+    {"completion",
+     "bash|zsh",
+     "print what this shell needs to complete command lines",
+     1,
+     1,
+     {},
+     kShells,
+     run_completion},
     {"help", "[VERB]", "show this help, or that of a verb", 0, kWordsOfAVerb, {}, {}, run_help},
     {"version", "", "show the version", 0, 0, {}, {}, run_version},
 };

@@ -52,6 +52,14 @@ void check_or_mark(const fs::path& folder) {
   if (!marker) throw std::runtime_error(folder.string() + " cannot be written to");
 }
 
+/// Beside the command in the tree in which it was built, in a folder of its own where it is
+/// installed.
+fs::path converter_of(const fs::path& command) {
+  const auto beside = command.parent_path() / "mediidx-iconv";
+  if (fs::exists(beside)) return beside;
+  return command.parent_path().parent_path() / "libexec/mediidx/mediidx-iconv";
+}
+
 /// Named where the library looks for it; replaced at once when the command has moved.
 void link_program(const fs::path& program, const fs::path& link) {
   std::error_code ignored;
@@ -88,7 +96,7 @@ void DataFolder::make_root() const {
   }
   // The library has text converted by the program of this name.
   const auto command = fs::read_symlink("/proc/self/exe");
-  link_program(command.parent_path() / "mediidx-iconv", root() / "usr/bin/php");
+  link_program(converter_of(command), root() / "usr/bin/php");
   // And it has folders indexed by these: the command itself under other names.
   for (const char* name : {"tavoindex", "tavoindex_mgr"}) {
     link_program(command, root() / "usr/tavo/bin" / name);

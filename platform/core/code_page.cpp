@@ -10,6 +10,7 @@
 #include <string_view>
 
 #include "border.h"
+#include "utf8.h"
 
 namespace {
 
@@ -79,7 +80,8 @@ extern "C" int TLIBCUnicodeStrCPToUTF8(const char* codepage, const char* text, c
   Converter converter(charset_of(codepage));
   if (!converter.is_open()) return failed(-1, TAVO_ERR_BAD_PARAMETERS, "code_page.cpp", 2);
   const long written = converter.convert(text, out, static_cast<std::size_t>(size) - 1);
-  if (written < 0) {
+  // iconv knows characters beyond the last of Unicode.
+  if (written < 0 || !mediidx::platform::is_utf8({out, static_cast<std::size_t>(written)})) {
     *out = '\0';
     return failed(-1, TAVO_ERR_BAD_PARAMETERS, "code_page.cpp", 3);
   }

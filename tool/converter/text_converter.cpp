@@ -31,6 +31,23 @@ std::string source_name(const std::string& charset) {
   return std::string(kUtf16) + charset.substr(kUcs2.size());
 }
 
+/// iconv knows characters beyond the last of Unicode, in UTF-8 of up to six bytes: each is
+/// replaced.
+std::string within_unicode(std::string text, const std::string& replacement) {
+  const auto is_beyond = [&text](std::size_t at) {
+    const auto byte = [&](std::size_t place) {
+      return place < text.size() ? static_cast<unsigned char>(text[place]) : 0U;
+    };
+    return byte(at) > 0xF4U || (byte(at) == 0xF4U && byte(at + 1) > 0x8FU);
+  };
+  for (std::size_t at = 0; at < text.size(); ++at) {
+    if (!is_beyond(at)) continue;
+    const auto lead = static_cast<unsigned char>(text[at]);
+    text.replace(at, lead < 0xF8U ? 4 : lead < 0xFCU ? 5 : 6, replacement);
+  }
+  return text;
+}
+
 }  // namespace
 
 TextConverter::TextConverter(const std::string& from, const std::string& to)
@@ -61,7 +78,8 @@ std::string TextConverter::run(std::string_view text, bool is_last) {
     const auto converted = left > 0 ? iconv(descriptor_, &from, &left, &to, &room)
                                     : iconv(descriptor_, nullptr, nullptr, &to, &room);
     const int error = converted == static_cast<std::size_t>(-1) ? errno : 0;
-    out.append(buffer.data(), to);
+    const std::string piece(buffer.data(), to);
+    out += to_utf8_ ? within_unicode(piece, replacement_) : piece;
     if (error == EINVAL && !is_last) {
       rest_.assign(from, left);
       break;

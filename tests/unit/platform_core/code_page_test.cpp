@@ -64,17 +64,19 @@ TEST_P(BadCodePage, IsRefused) {
             1);
 }
 
-INSTANTIATE_TEST_SUITE_P(Cases, BadCodePage,
-                         testing::Values(BadCodePageCase{"Unknown", "xyz", "a"},
-                                         BadCodePageCase{"Empty", "", "a"},
-                                         BadCodePageCase{"None", nullptr, "a"},
-                                         BadCodePageCase{"NoText", "enu", nullptr},
-                                         BadCodePageCase{"UpperCaseCode", "ENU", "a"},
-                                         BadCodePageCase{"Flags", "UTF-8//IGNORE", "\xFF"},
-                                         BadCodePageCase{"NoUtf8", "utf8", "caf\xE9"},
-                                         BadCodePageCase{"UndefinedByte", "enu", "\x81"},
-                                         BadCodePageCase{"CutCharacter", "jpn", "\x93"}),
-                         [](const auto& test) { return test.param.name; });
+INSTANTIATE_TEST_SUITE_P(
+    Cases, BadCodePage,
+    testing::Values(BadCodePageCase{"Unknown", "xyz", "a"}, BadCodePageCase{"Empty", "", "a"},
+                    BadCodePageCase{"None", nullptr, "a"},
+                    BadCodePageCase{"NoText", "enu", nullptr},
+                    BadCodePageCase{"UpperCaseCode", "ENU", "a"},
+                    BadCodePageCase{"Flags", "UTF-8//IGNORE", "\xFF"},
+                    BadCodePageCase{"NoUtf8", "utf8", "caf\xE9"},
+                    BadCodePageCase{"UndefinedByte", "enu", "\x81"},
+                    BadCodePageCase{"CutCharacter", "jpn", "\x93"},
+                    BadCodePageCase{"BeyondUnicode", "utf8", "\xF4\x90\x80\x80"},
+                    BadCodePageCase{"SixBytes", "utf8", "\xFC\xAD\xAD\xAD\xAD\xAD"}),
+    [](const auto& test) { return test.param.name; });
 
 TEST(ConvertedText, HasToFitWithItsEnd) {
   std::array<char, 5> out{};

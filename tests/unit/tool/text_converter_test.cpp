@@ -64,6 +64,14 @@ INSTANTIATE_TEST_SUITE_P(NamesOfTheDetector, LegacyText,
                                          LegacyCase{"IBM852", "\x9D\xA2\xAB", "Łóź"},
                                          LegacyCase{"UTF-8", "Caf\xC3\xA9", "Café"}));
 
+INSTANTIATE_TEST_SUITE_P(
+    CharactersBeyondUnicode, LegacyText,
+    testing::Values(LegacyCase{"UTF-8", "a\xF4\x90\x80\x80z", "a\uFFFDz"},
+                    LegacyCase{"UTF-8", "\xF7\xBF\xBF\xBF\xF4\x8F\xBF\xBF", "\uFFFD\U0010FFFF"},
+                    LegacyCase{"UTF-8", "\xFB\xBF\xBF\xBF\xBF\xFD\xBF\xBF\xBF\xBF\xBF.",
+                               "\uFFFD\uFFFD."},
+                    LegacyCase{"UCS-4BE", "\x7F\xFF\xFF\xFF\0\0\0A"s, "\uFFFDA"}));
+
 INSTANTIATE_TEST_SUITE_P(TwoByteUnits, LegacyText,
                          testing::Values(LegacyCase{"UCS-2BE", "\0A\x04\x1C"s, "AМ"},
                                          LegacyCase{"UCS-2LE", "A\0\x1C\x04"s, "AМ"},

@@ -14,6 +14,7 @@
 #include <cerrno>
 #include <charconv>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <filesystem>
 #include <optional>
@@ -168,11 +169,14 @@ std::string_view trimmed(std::string_view text) {
   return text.substr(first, text.find_last_not_of(kBlanks) - first + 1);
 }
 
-/// Whether a line, without its end, holds a rating of the user.
+/// Whether a line, without its end, holds a rating of the user: as the index reads it, which takes
+/// the number at the beginning of a key and leaves out what follows.
 bool is_of(std::string_view line, std::uint32_t user) {
   const auto equals = line.find('=');
   if (equals == std::string_view::npos) return false;
-  return number_from<std::uint32_t>(trimmed(line.substr(0, equals))) == user;
+  const std::string key(trimmed(line.substr(0, equals)));
+  if (key.empty() || key.starts_with('#') || key.find('\0') != std::string::npos) return false;
+  return std::strtoll(key.c_str(), nullptr, 10) == std::int64_t{user};
 }
 
 }  // namespace
@@ -197,7 +201,12 @@ Ratings read_ratings(const std::string& song) {
 
 std::string with_rating(std::string_view text, std::uint32_t user, int stars) {
   const auto rating = std::to_string(user) + "=" + std::to_string(stars) + "\n";
+  constexpr std::string_view kByteOrderMark = "\xEF\xBB\xBF";
   std::string out;
+  if (text.starts_with(kByteOrderMark)) {
+    out = kByteOrderMark;
+    text.remove_prefix(kByteOrderMark.size());
+  }
   bool is_written = stars == 0;
   while (!text.empty()) {
     const auto line = text.substr(0, text.find('\n'));
@@ -209,7 +218,8 @@ std::string with_rating(std::string_view text, std::uint32_t user, int stars) {
       is_written = true;
     }
   }
-  return is_written ? out : out + rating;
+  if (!is_written) out += rating;
+  return out == kByteOrderMark ? std::string() : out;
 }
 
 void write_rating(const std::string& song, std::uint32_t user, int stars) {

@@ -150,6 +150,22 @@ TEST(ATextOfRatings, GetsOneLineAUser) {
   EXPECT_EQ(with_rating("#7=1\n", 7, 0), "#7=1\n");
 }
 
+TEST(ATextOfRatings, KnowsAUserByTheNumberAtTheBeginningOfAKey) {
+  EXPECT_EQ(with_rating("7\"=1\n07=2\n+7=3\n7 8=4\nx7=5\n", 7, 3), "7=3\nx7=5\n");
+}
+
+TEST(ATextOfRatings, KeepsItsByteOrderMark) {
+  EXPECT_EQ(with_rating("\xEF\xBB\xBF"
+                        "7=1\n8=2\n",
+                        7, 3),
+            "\xEF\xBB\xBF"
+            "7=3\n8=2\n");
+  EXPECT_EQ(with_rating("\xEF\xBB\xBF"
+                        "7=1\n",
+                        7, 0),
+            "");
+}
+
 TEST(ARatingTag, CountsStarsAsPlayersDo) {
   EXPECT_EQ(tool::stars_of_popm(0), std::nullopt);
   for (int stars = 1; stars <= 5; ++stars) {

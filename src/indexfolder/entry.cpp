@@ -27,7 +27,7 @@ bool reads_as_flag(const Json::Value& value) {
 
 bool is_usable_entry(const Json::Value& entry) {
   const auto path = find_entry_path(entry);
-  if (!path || path->empty()) return false;
+  if (!path || path->empty() || path->find('\0') != path->npos) return false;
   for (const auto flag : kFlags) {
     const auto* value = find_member(entry, flag);
     if (value && !reads_as_flag(*value)) return false;

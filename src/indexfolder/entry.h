@@ -15,8 +15,8 @@
 
 namespace mediidx {
 
-/// True for an object with a text as path that is not empty, and flags that read as true or false.
-/// Other entries are passed over wherever a configuration is read.
+/// True for an object with a text as path that is not empty and holds no NUL, and flags that read as
+/// true or false. Other entries are passed over wherever a configuration is read.
 bool is_usable_entry(const Json::Value& entry);
 
 /// The entry's path within the entry; empty when it has none, nothing when the entry is no object

@@ -85,6 +85,7 @@ TEST_F(MemoryCopy, PassesOverEntriesThatAreNotUsable) {
   const auto photo = add_share("photo");
   load(R"([1, "/photo", null, [], {}, {"photo": true}, {"path": ""}, {"path": null}, {"path": 1},
            {"path": {}}, {"path": "/photo/a", "music": "on"}, {"path": "/photo/b", "video": []},
+           {"path": "/photo\u0000"}, {"path": "/photo/d\u0000", "photo": true},
            {"path": "/photo/c", "photo": 1, "music": 0.5, "video": null}])");
   EXPECT_THAT(loaded_paths(), ElementsAre(photo + "/c"));
   EXPECT_EQ(IndexFolderIsIndexTypeAt(0, 2), 1);

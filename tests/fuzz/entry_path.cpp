@@ -2,11 +2,29 @@
 // SPDX-License-Identifier: MIT
 #include "playlist/entry_path.h"
 
+#include <strings.h>
+
 #include <array>
 #include <vector>
 
 #include "fuzz.h"
 #include "mediidx/playlist.h"
+#include "mediidx/root.h"
+#include "scratch.h"
+
+namespace {
+
+/// As other programs resolve an entry.
+void resolve_simply(const std::string& playlist, std::string_view entry) {
+  std::vector<char> text(entry.begin(), entry.end());
+  text.push_back('\0');
+  std::array<char, MEDIIDX_PATH_SIZE> out;
+  out.fill('x');
+  ABSPlayListPath(playlist.c_str(), text.data(), out.data());
+  mediidx::fuzz::check(std::memchr(out.data(), '\0', out.size()) != nullptr);
+}
+
+}  // namespace
 
 // Two lines: the playlist's path and the entry.
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size) {
@@ -20,11 +38,14 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     const auto path = resolve_entry(entry, playlist, link);
     fuzz::check(!path || (path->size() < MEDIIDX_PATH_SIZE && path->find('\\') == path->npos));
   }
-  std::vector<char> text(entry.begin(), entry.end());
-  text.push_back('\0');
-  std::array<char, MEDIIDX_PATH_SIZE> out;
-  out.fill('x');
-  ABSPlayListPath(std::string(playlist).c_str(), text.data(), out.data());
-  fuzz::check(std::memchr(out.data(), '\0', out.size()) != nullptr);
+  fuzz::check(begins_with_http(entry) ==
+              (entry.size() >= 4 && strncasecmp(entry.data(), "http", 4) == 0));
+  // With the link to the music, and without it.
+  static const test::ScratchRoot root;
+  static const auto link = root.make_link("var/services/music", "/volume1/music");
+  for (const char* top : {root.path().c_str(), "/nowhere"}) {
+    TAVOMediaIndexRootSet(top);
+    resolve_simply(std::string(playlist), entry);
+  }
   return 0;
 }

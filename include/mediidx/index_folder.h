@@ -19,7 +19,9 @@
 
 extern "C" {
 
-/// The in-memory copy: an empty array until IndexFolderInit or IndexFolderUpdate.
+/// The in-memory copy: an empty array until IndexFolderInit or IndexFolderUpdate. A caller may
+/// replace it, clear it and append to it at any time, and change what it holds between
+/// IndexFolderConfLock and IndexFolderConfUnLock.
 extern MEDIIDX_EXPORT Json::Value gIndexFolderConf;
 #endif
 

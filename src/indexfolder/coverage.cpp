@@ -6,12 +6,13 @@
 #include <strings.h>
 #include <sys/stat.h>
 
-#include <cstring>
+#include <algorithm>
 #include <stdexcept>
 #include <string>
 #include <string_view>
 
 #include "indexfolder/entry.h"
+#include "indexfolder/folder_index.h"
 #include "indexfolder/reload_lock.h"
 #include "mediidx/index_folder.h"
 #include "support/log.h"
@@ -22,35 +23,6 @@ namespace {
 
 constexpr int kNoPath = 201;
 constexpr int kWrongKind = 202;
-
-/// True when `path` lies below `folder`, which may end with a slash. Throws std::out_of_range for
-/// an empty folder.
-bool lies_below(std::string_view path, std::string_view folder) {
-  if (folder.empty()) throw std::out_of_range("index folder without a path");
-  if (!path.starts_with(folder)) return false;
-  return folder.back() == '/' || path.substr(folder.size()).starts_with('/');
-}
-
-/// The first entry of the in-memory copy whose path satisfies `holds`; null when none does.
-template <class Predicate>
-const Json::Value* find_entry_if(Predicate&& holds) {
-  if (!gIndexFolderConf.isArray()) return nullptr;
-  for (const auto& entry : gIndexFolderConf) {
-    const auto path = find_entry_path(entry);
-    if (path && holds(*path)) return &entry;
-  }
-  return nullptr;
-}
-
-template <class Predicate>
-int one_or_minus_one(Predicate&& holds) {
-  const ReloadLock lock;
-  return find_entry_if(holds) ? 1 : -1;
-}
-
-bool is_or_holds(std::string_view folder, std::string_view path) {
-  return folder == path || (folder.size() <= path.size() && lies_below(path, folder));
-}
 
 /// A playlist is indexed where music is.
 int flag_for(const Json::Value& entry, int kind) {
@@ -81,6 +53,17 @@ bool is_in_share(std::string_view entry, std::string_view share) {
   return strncasecmp(entry.data(), share.data(), share.size()) == 0 &&
          (has_slash || entry[share.size()] == '/');
 }
+
+/// Not a question of each file: a walk does.
+bool is_any_in_share(std::string_view share) {
+  return gIndexFolderConf.isArray() &&
+         std::ranges::any_of(gIndexFolderConf, [&](const Json::Value& entry) {
+           const auto path = find_entry_path(entry);
+           return path && is_in_share(*path, share);
+         });
+}
+
+int one_or_minus_one(bool answer) { return answer ? 1 : -1; }
 
 bool is_folder(const std::string& path) {
   struct stat status;
@@ -116,51 +99,44 @@ int find_index_folder(const Json::Value& conf, const std::string& path, const Js
 }  // namespace mediidx
 
 using mediidx::one_or_minus_one;
+using mediidx::Reach;
+using mediidx::ReloadLock;
 
 extern "C" int IndexFolderIsPathIndexed(const char* path, int kind) {
   if (!mediidx::is_answerable(path, kind)) {
     // Never locked; but a reload that waits is done now.
-    IndexFolderConfUnLock();
+    mediidx::let_reloads_through();
     return -1;
   }
-  const mediidx::ReloadLock lock;
-  const auto* entry = mediidx::find_entry_if(
-      [&](std::string_view folder) { return mediidx::is_or_holds(folder, path); });
+  const ReloadLock lock;
+  const auto* entry = mediidx::find_holder(path, Reach::kItselfOrAbove);
   return entry ? mediidx::flag_for(*entry, kind) : 0;
 }
 
 extern "C" int IndexFolderIsFolderIndexed(const char* path) {
   if (!path) return -1;
-  return one_or_minus_one(
-      [&](std::string_view folder) { return mediidx::is_or_holds(folder, path); });
+  const ReloadLock lock;
+  return one_or_minus_one(mediidx::find_holder(path, Reach::kItselfOrAbove));
 }
 
 extern "C" int IndexFolderIsFolderHasParent(const char* path) {
   if (!path) return -1;
-  const std::string_view child = path;
-  return one_or_minus_one([&](std::string_view folder) {
-    return folder.size() < child.size() && mediidx::lies_below(child, folder);
-  });
+  const ReloadLock lock;
+  return one_or_minus_one(mediidx::find_holder(path, Reach::kAbove));
 }
 
 extern "C" int IndexFolderIsCoveredByShare(const char* sharePath) {
   if (!sharePath) return -1;
   const std::string_view share = sharePath;
   if (share.empty()) throw std::out_of_range("share without a path");
-  return one_or_minus_one(
-      [&](std::string_view folder) { return mediidx::is_in_share(folder, share); });
+  const ReloadLock lock;
+  return one_or_minus_one(mediidx::is_any_in_share(share));
 }
 
 extern "C" int IndexFolderPositionGet(const char* path) {
   if (!path) return -1;
-  const mediidx::ReloadLock lock;
-  const std::string_view wanted = path;
-  int position = 0;
-  for (const auto& entry : gIndexFolderConf) {
-    if (mediidx::find_entry_path(entry) == wanted) return position;
-    ++position;
-  }
-  return -1;
+  const ReloadLock lock;
+  return mediidx::find_position(path);
 }
 
 int FindIndexFolderByPath(const Json::Value& conf, const char* path, const Json::Value** out) {

@@ -10,6 +10,8 @@
 #include <vector>
 
 #include "indexfolder/entry.h"
+#include "indexfolder/folder_index.h"
+#include "indexfolder/reload_lock.h"
 #include "mediidx/index_folder.h"
 #include "support/log.h"
 #include "support/no_throw.h"
@@ -144,11 +146,20 @@ extern "C" void IndexFolderUpdate() {
 extern "C" void IndexFolderConfLock() { gIsBlockUpdate = 1; }
 
 extern "C" void IndexFolderConfUnLock() {
+  mediidx::forget_folder_index();
+  mediidx::let_reloads_through();
+}
+
+namespace mediidx {
+
+void let_reloads_through() {
   gIsBlockUpdate = 0;
   if (!gIsDirty) return;
   gIsDirty = 0;
   IndexFolderUpdate();
 }
+
+}  // namespace mediidx
 
 extern "C" void IndexFolderFree() {
   no_throw(kIndexFolderLog, 0, [] {

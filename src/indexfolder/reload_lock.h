@@ -5,15 +5,23 @@
 #ifndef MEDIIDX_INDEXFOLDER_RELOAD_LOCK_H_
 #define MEDIIDX_INDEXFOLDER_RELOAD_LOCK_H_
 
+#include "indexfolder/folder_index.h"
 #include "mediidx/index_folder.h"
 
 namespace mediidx {
 
+/// Ends the deferral, and does the reload that was asked for meanwhile.
+void let_reloads_through();
+
 /// Does not nest: the first to end lets reloads through.
 class ReloadLock {
  public:
-  ReloadLock() { IndexFolderConfLock(); }
-  ~ReloadLock() { IndexFolderConfUnLock(); }
+  ReloadLock() {
+    // Locked already: by a caller, who may be changing entries.
+    if (gIsBlockUpdate) forget_folder_index();
+    gIsBlockUpdate = 1;
+  }
+  ~ReloadLock() { let_reloads_through(); }
   ReloadLock(const ReloadLock&) = delete;
   ReloadLock& operator=(const ReloadLock&) = delete;
 };

@@ -5,7 +5,6 @@
 #include <algorithm>
 #include <array>
 #include <charconv>
-#include <optional>
 
 namespace mediidx::platform {
 
@@ -64,102 +63,46 @@ std::string_view next_word(std::string_view& line) {
   return word;
 }
 
-std::optional<int> parse_id(std::string_view word) {
-  int id = 0;
-  const auto read = std::from_chars(word.data(), word.data() + word.size(), id);
-  const bool whole = read.ec == std::errc() && read.ptr == word.data() + word.size();
-  return whole ? std::optional(id) : std::nullopt;
-}
-
-bool is_octal(char c) { return c >= '0' && c <= '7'; }
-
-/// Undoes the kernel's "\040" for blanks, tabs, line ends and backslashes.
-std::string unescaped(std::string_view word) {
-  std::string text;
-  for (std::size_t at = 0; at < word.size(); ++at) {
-    const auto code = word.substr(at, 4);
-    if (code.size() == 4 && code[0] == '\\' && std::ranges::all_of(code.substr(1), is_octal)) {
-      text += static_cast<char>((code[1] - '0') * 64 + (code[2] - '0') * 8 + (code[3] - '0'));
-      at += 3;
-    } else {
-      text += word[at];
-    }
-  }
-  return text;
+bool is_number(std::string_view word, int number) {
+  int read_number = 0;
+  const auto read = std::from_chars(word.data(), word.data() + word.size(), read_number);
+  return read.ec == std::errc() && read.ptr == word.data() + word.size() && read_number == number;
 }
 
 // id parent device root point options [optional…] - type source options
-std::optional<Mount> parse_mount(std::string_view line) {
-  const auto id = parse_id(next_word(line));
-  const auto parent = parse_id(next_word(line));
-  next_word(line);
-  next_word(line);
-  Mount mount;
-  mount.point = unescaped(next_word(line));
-  next_word(line);
+std::string_view type_in(std::string_view line) {
   while (!line.empty() && next_word(line) != "-") {
   }
-  mount.type = next_word(line);
-  if (!id || !parent || !mount.point.starts_with('/') || mount.type.empty()) return std::nullopt;
-  mount.id = *id;
-  mount.parent = *parent;
-  return mount;
-}
-
-bool holds(std::string_view point, std::string_view path) {
-  if (point == "/") return path.starts_with('/');
-  return path.starts_with(point) && (path.size() == point.size() || path[point.size()] == '/');
-}
-
-/// Whether `mount` hangs below `above`, or, with null, below nothing in the list.
-bool is_child(const std::vector<Mount>& mounts, const Mount& mount, const Mount* above) {
-  if (above) return mount.parent == above->id && mount.id != above->id;
-  return mount.parent == mount.id ||
-         std::ranges::find(mounts, mount.parent, &Mount::id) == mounts.end();
-}
-
-/// Of the mounts on `above` the first that a walk along the path enters; among equals the last.
-const Mount* next_on_the_way(const std::vector<Mount>& mounts, const Mount* above,
-                             std::string_view path) {
-  const Mount* next = nullptr;
-  for (const Mount& mount : mounts) {
-    if (!holds(mount.point, path) || !is_child(mounts, mount, above)) continue;
-    if (!next || mount.point.size() <= next->point.size()) next = &mount;
-  }
-  return next;
+  return next_word(line);
 }
 
 }  // namespace
 
-std::vector<Mount> parse_mounts(std::string_view mountinfo) {
-  std::vector<Mount> mounts;
+std::string_view find_mount_type(std::string_view mountinfo, int id) {
   while (!mountinfo.empty()) {
-    const auto line = mountinfo.substr(0, mountinfo.find('\n'));
+    auto line = mountinfo.substr(0, mountinfo.find('\n'));
     mountinfo.remove_prefix(std::min(mountinfo.size(), line.size() + 1));
-    if (auto mount = parse_mount(line)) mounts.push_back(std::move(*mount));
+    if (is_number(next_word(line), id)) return type_in(line);
   }
-  return mounts;
-}
-
-const Mount* find_mount(const std::vector<Mount>& mounts, std::string_view path) {
-  const Mount* reached = nullptr;
-  // Each step enters another mount; a list that runs in circles ends with its length.
-  for (std::size_t step = 0; step < mounts.size(); ++step) {
-    const Mount* next = next_on_the_way(mounts, reached, path);
-    if (!next) break;
-    reached = next;
-  }
-  return reached;
+  return {};
 }
 
 bool is_remote_type(std::string_view type) {
   return std::ranges::binary_search(kRemoteTypes, type);
 }
 
-bool is_remote(std::string_view mountinfo, std::string_view path) {
-  const auto mounts = parse_mounts(mountinfo);
-  const Mount* mount = find_mount(mounts, path);
-  return mount && is_remote_type(mount->type);
+std::optional<bool> RemoteMounts::find(std::optional<std::uint64_t> mount) const {
+  if (!mount) return std::nullopt;
+  const auto known = remote_.find(*mount);
+  return known == remote_.end() ? std::nullopt : std::optional(known->second);
+}
+
+bool RemoteMounts::learn(std::optional<std::uint64_t> mount, std::string_view type) {
+  const bool remote = is_remote_type(type);
+  if (!mount || type.empty()) return remote;
+  if (remote_.size() >= kMostMounts) remote_.clear();
+  remote_[*mount] = remote;
+  return remote;
 }
 
 }  // namespace mediidx::platform

@@ -1,36 +1,38 @@
 // SPDX-FileCopyrightText: The mediidx developers
 // SPDX-License-Identifier: MIT
 
-/// The mounts of this process, as /proc/self/mountinfo lists them.
+/// The types of the file systems that are mounted.
 #ifndef TAVOSDK_MOUNT_TABLE_H_
 #define TAVOSDK_MOUNT_TABLE_H_
 
-#include <string>
+#include <cstdint>
+#include <optional>
 #include <string_view>
-#include <vector>
+#include <unordered_map>
 
 namespace mediidx::platform {
 
-struct Mount {
-  int id = 0;
-  int parent = 0;
-  std::string point;  ///< Where it is mounted, escapes undone.
-  std::string type;   ///< "ext4", "nfs4", "fuse.sshfs"
-};
-
-/// Reads a mount list; lines that are none are passed over.
-std::vector<Mount> parse_mounts(std::string_view mountinfo);
-
-/// The mount that an absolute, resolved path lies on: from the root each mount that is mounted on
-/// the one before is entered, as the kernel walks, so that what a later mount hides does not count.
-/// Null when none holds the path.
-const Mount* find_mount(const std::vector<Mount>& mounts, std::string_view path);
+/// The type ("ext4", "nfs4", "fuse.sshfs") of the mount with this id in a list such as
+/// /proc/self/mountinfo; empty when it is not there.
+std::string_view find_mount_type(std::string_view mountinfo, int id);
 
 /// Whether files of this type of file system come over a network.
 bool is_remote_type(std::string_view type);
 
-/// Whether a resolved path lies on a network mount of that mount list.
-bool is_remote(std::string_view mountinfo, std::string_view path);
+/// Which mounts are remote, by the unique number of each. A mount keeps its type for as long as it
+/// is there, and its number is never given again: nothing that is known grows old.
+class RemoteMounts {
+ public:
+  /// Nothing for one that is not known yet, or has no unique number.
+  std::optional<bool> find(std::optional<std::uint64_t> mount) const;
+  /// Whether a mount of this type is remote. One without a type, which was just unmounted, is not
+  /// remembered.
+  bool learn(std::optional<std::uint64_t> mount, std::string_view type);
+
+ private:
+  static constexpr std::size_t kMostMounts = 1000;
+  std::unordered_map<std::uint64_t, bool> remote_;
+};
 
 }  // namespace mediidx::platform
 

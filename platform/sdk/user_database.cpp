@@ -78,32 +78,50 @@ struct Stamp {
   bool operator==(const Stamp&) const = default;
 };
 
-Stamp stamp_of(const std::string& path) {
-  struct stat info{};
-  if (stat(path.c_str(), &info) != 0) return {};
-  return {info.st_dev, info.st_ino, info.st_size, info.st_mtim.tv_sec, info.st_mtim.tv_nsec};
+/// The time of the change of the inode: that of the content can be set back.
+Stamp to_stamp(const struct stat& info) {
+  return {info.st_dev, info.st_ino, info.st_size, info.st_ctim.tv_sec, info.st_ctim.tv_nsec};
 }
 
-/// etc/passwd below the root, when a root is set and has one.
-std::optional<std::string> passwd_below_root() {
-  if (*TAVOPlatformRootGet() == '\0') return std::nullopt;
-  auto path = below_root(kPasswd);
+/// False while another change could leave the same stamp, for times of files advance in steps.
+bool is_settled(const Stamp& stamp) {
+  using std::chrono::nanoseconds;
+  using std::chrono::seconds;
+  constexpr std::chrono::milliseconds kLongestStep{100};
+  const auto changed = seconds(stamp.changed_s) + nanoseconds(stamp.changed_ns);
+  return std::chrono::system_clock::now().time_since_epoch() - changed > kLongestStep;
+}
+
+/// Where the users come from: from etc/passwd below the root, when a root is set and has one, else
+/// from the system.
+struct Source {
+  bool own_file = false;
+  std::string file;
+  Stamp stamp;
+};
+
+Source user_source() {
   struct stat info{};
-  if (stat(path.c_str(), &info) != 0 || !S_ISREG(info.st_mode)) return std::nullopt;
-  return path;
+  if (*TAVOPlatformRootGet() != '\0') {
+    auto path = below_root(kPasswd);
+    if (stat(path.c_str(), &info) == 0 && S_ISREG(info.st_mode)) {
+      return {true, std::move(path), to_stamp(info)};
+    }
+  }
+  return {false, kPasswd, stat(kPasswd, &info) == 0 ? to_stamp(info) : Stamp()};
 }
 
 struct UserCache {
-  std::string file;
-  Stamp stamp;
+  Source source;
+  bool settled = false;
   std::chrono::steady_clock::time_point read_at;
   unsigned generation = 0;
   std::vector<User> users;
 
-  bool is_fresh(const std::string& path, const Stamp& now, bool own_file) const {
+  bool is_fresh(const Source& now) const {
     constexpr std::chrono::seconds kTrusted{10};
-    const bool unchanged = generation > 0 && file == path && stamp == now;
-    return unchanged && (own_file || std::chrono::steady_clock::now() - read_at < kTrusted);
+    const bool unchanged = settled && source.file == now.file && source.stamp == now.stamp;
+    return unchanged && (source.own_file || std::chrono::steady_clock::now() - read_at < kTrusted);
   }
 };
 
@@ -123,14 +141,15 @@ std::optional<User> find_listed(Matches matches) {
 }  // namespace
 
 const std::vector<User>& all_users() {
-  const auto own = passwd_below_root();
-  const std::string path = own.value_or(kPasswd);
-  const Stamp stamp = stamp_of(path);
+  auto source = user_source();
   UserCache& cache = user_cache();
-  if (cache.is_fresh(path, stamp, own.has_value())) return cache.users;
-  cache.users = own ? read_passwd_file(path) : read_system_users();
-  cache.file = path;
-  cache.stamp = stamp;
+  if (cache.is_fresh(source)) return cache.users;
+  // Asked for before the users are read: a change meanwhile is seen the next time.
+  const bool settled = is_settled(source.stamp);
+  cache.settled = false;
+  cache.users = source.own_file ? read_passwd_file(source.file) : read_system_users();
+  cache.source = std::move(source);
+  cache.settled = settled;
   cache.read_at = std::chrono::steady_clock::now();
   ++cache.generation;
   return cache.users;
@@ -139,7 +158,8 @@ const std::vector<User>& all_users() {
 unsigned all_users_generation() { return user_cache().generation; }
 
 std::optional<User> find_user(const std::string& name) {
-  if (passwd_below_root()) return find_listed([&](const User& user) { return user.name == name; });
+  if (user_source().own_file)
+    return find_listed([&](const User& user) { return user.name == name; });
   std::vector<char> buffer(kFirstBuffer);
   return with_growing_buffer(buffer, [&](passwd& entry, std::vector<char>& room, passwd*& found) {
     return getpwnam_r(name.c_str(), &entry, room.data(), room.size(), &found);
@@ -147,7 +167,7 @@ std::optional<User> find_user(const std::string& name) {
 }
 
 std::optional<User> find_user(std::uint32_t uid) {
-  if (passwd_below_root()) return find_listed([&](const User& user) { return user.uid == uid; });
+  if (user_source().own_file) return find_listed([&](const User& user) { return user.uid == uid; });
   std::vector<char> buffer(kFirstBuffer);
   return with_growing_buffer(buffer, [&](passwd& entry, std::vector<char>& room, passwd*& found) {
     return getpwuid_r(uid, &entry, room.data(), room.size(), &found);

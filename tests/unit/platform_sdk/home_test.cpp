@@ -126,6 +126,29 @@ TEST_F(TheHomeCheck, SeesNewUsersAndDeletedOnes) {
   EXPECT_EQ(check("/nowhere/anna/x"), 0);
 }
 
+TEST_F(TheHomeCheck, SeesEachOfManyChangesThatLeaveSizeAndNameOfTheFile) {
+  const std::filesystem::path file = root_.at("etc/passwd");
+  add_user("anna", 1000, "/nowhere/anna");
+  const auto written = std::filesystem::last_write_time(file);
+  for (int i = 0; i < 100; ++i) {
+    const auto id = std::to_string(1000 + i);
+    root_.write("etc/passwd", "u" + id + ":x:" + id + ":1000::/nowhere/" + id + ":/bin/sh\n");
+    std::filesystem::last_write_time(file, written);
+    EXPECT_EQ(check("/nowhere/" + id + "/x"), 1);
+    EXPECT_EQ(check("/nowhere/" + std::to_string(999 + i) + "/x"), 0);
+  }
+}
+
+TEST_F(TheHomeCheck, SeesAFileOfTheRootThatComesAndGoes) {
+  add_user("anna", 1000, "/nowhere/anna");
+  EXPECT_EQ(check("/nowhere/anna/x"), 1);
+  std::filesystem::remove(root_.at("etc/passwd"));
+  EXPECT_EQ(check("/nowhere/anna/x"), 0);
+  add_user("ben", 1001, "/nowhere/ben");
+  EXPECT_EQ(check("/nowhere/anna/x"), 1);
+  EXPECT_EQ(check("/nowhere/ben/x"), 1);
+}
+
 TEST_F(TheHomeCheck, HasNoHomeWithoutUsers) {
   root_.write("etc/passwd", "");
   EXPECT_EQ(check("/home/anna"), 0);

@@ -9,6 +9,7 @@
 
 #ifdef __cplusplus
 #include <string>
+#include <string_view>
 #include <vector>
 
 extern "C" {
@@ -22,6 +23,11 @@ MEDIIDX_EXPORT int TAVOParseCueByPath(struct _PLAYLIST_REC** out, const char* cu
 
 #ifdef __cplusplus
 }  // extern "C"
+
+class MediaInfoCueParser;
+namespace mediidx {
+int parse_cue_line(MediaInfoCueParser& parser, std::string_view line, const char* cue_path);
+}
 
 /// Turns the lines of one cue sheet, in UTF-8, into records. Positions are texts of minutes,
 /// seconds and frames (mm:ss:ff) at 75 frames a second. Lines that say too little are ignored.
@@ -50,11 +56,13 @@ class MEDIIDX_EXPORT MediaInfoCueParser {
   int ParseCommand(std::string line, const char* cuePath);
 
  private:
-  using Tokens = std::vector<std::string>;
-  int ParseFile(const Tokens& tokens, const char* cuePath);
-  void ParseTrack(const Tokens& tokens);
-  int ParseIndex(const Tokens& tokens);
-  void ParseRemark(const Tokens& tokens);
+  friend int mediidx::parse_cue_line(MediaInfoCueParser& parser, std::string_view line,
+                                     const char* cue_path);
+  int ParseLine(std::string_view line, const char* cuePath);
+  int ParseFile(std::string_view text, const char* cuePath);
+  void ParseTrack(std::string_view number);
+  void ParseIndex(std::string_view number, std::string_view position);
+  void ParseRemark(std::string_view key, std::string_view text);
   /// The field of the current track, or of the sheet before the first one.
   char (&TextField(char (__tag_TAVO_MEDIA_INFO::*field)[MEDIIDX_TEXT_SIZE]))[MEDIIDX_TEXT_SIZE];
   int CalDurationOfLast(int trackIndex);

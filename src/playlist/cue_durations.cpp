@@ -26,7 +26,7 @@ bool parse_again(std::span<const std::string> lines, const char* cue_path,
   const CueDurations durations(known);
   MediaInfoCueParser parser;
   for (const auto& line : lines) {
-    if (parser.ParseCommand(line, cue_path) == 0) return false;
+    if (parse_cue_line(parser, line, cue_path) == 0) return false;
   }
   return parser.OutputResultLists(out) != 0;
 }

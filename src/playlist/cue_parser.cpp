@@ -3,10 +3,10 @@
 #include <tavodb.h>
 #include <tavoindex.h>
 
+#include <algorithm>
 #include <array>
 #include <cmath>
 #include <cstdlib>
-#include <cstring>
 #include <limits>
 #include <optional>
 #include <string_view>
@@ -26,15 +26,59 @@ namespace {
 
 constexpr Template<const char*> kSelectMusic{"SELECT * FROM music WHERE path = '@TAVO:VAR'"};
 
-std::vector<std::string> split_at_white_space(std::string_view line) {
-  constexpr std::string_view kWhiteSpace = " \t\n\v\f\r";
-  std::vector<std::string> tokens;
-  for (auto begin = line.find_first_not_of(kWhiteSpace); begin != line.npos;) {
-    const auto end = line.find_first_of(kWhiteSpace, begin);
-    tokens.emplace_back(line.substr(begin, end - begin));
-    begin = line.find_first_not_of(kWhiteSpace, end);
+/// One comparison for what most characters are.
+constexpr bool is_white_space(char c) {
+  return static_cast<unsigned char>(c) <= ' ' && (c == ' ' || (c >= '\t' && c <= '\r'));
+}
+
+std::string_view without_leading_space(std::string_view text) {
+  const auto* begin = std::ranges::find_if_not(text, is_white_space);
+  return {begin, text.end()};
+}
+
+std::string_view trimmed(std::string_view text) {
+  while (!text.empty() && is_white_space(text.back())) text.remove_suffix(1);
+  return without_leading_space(text);
+}
+
+/// Takes the first word, and the white space behind it, off a trimmed text.
+std::string_view take_word(std::string_view& text) {
+  const auto* end = std::ranges::find_if(text, is_white_space);
+  const std::string_view word(text.begin(), end);
+  text = without_leading_space({end, text.end()});
+  return word;
+}
+
+/// A trimmed text of one word stays as it is.
+std::string_view without_last_word(std::string_view text) {
+  auto length = text.size();
+  while (length > 0 && !is_white_space(text[length - 1])) --length;
+  return length == 0 ? text : trimmed(text.substr(0, length));
+}
+
+/// A trimmed text with every run of white space as one blank; kept in `room` where that changes it.
+std::string_view with_single_blanks(std::string_view text, std::string& room) {
+  const auto is_run = [](char a, char b) {
+    return is_white_space(a) && (a != ' ' || is_white_space(b));
+  };
+  if (std::ranges::adjacent_find(text, is_run) == text.end()) return text;
+  while (!text.empty()) {
+    if (!room.empty()) room += ' ';
+    room += take_word(text);
   }
-  return tokens;
+  return room;
+}
+
+/// The value that a trimmed text gives: its first word or, where that has a quote, all of it
+/// without its first and last character. What is not a part of the text is kept in `room`, which is
+/// empty.
+std::string_view value_of(std::string_view text, std::string& room) {
+  auto rest = text;
+  const auto word = take_word(rest);
+  if (word.find('"') == word.npos) return word;
+  auto value = with_single_blanks(text, room).substr(1);
+  if (!value.empty()) value.remove_suffix(1);
+  return value;
 }
 
 float seconds(std::int32_t frames) {
@@ -49,6 +93,28 @@ std::int32_t frames_from_seconds(double duration_s) {
   if (frames >= Range::max()) return Range::max();
   if (frames <= Range::min()) return Range::min();
   return static_cast<std::int32_t>(frames);
+}
+
+/// From a track's start to where it ends, less its postgap.
+float duration_until(std::int32_t end, const std::string& postgap, const char* start) {
+  const auto gap = postgap.empty() ? 0 : frames_from_position(postgap);
+  return seconds(subtract_frames(subtract_frames(end, gap), frames_from_position(start)));
+}
+
+/// Zeroed memory is given what a track of a sheet says; all else stays zero.
+void fill_record(__tag_TAVO_MEDIA_INFO& record, const __tag_TAVO_MEDIA_INFO& track,
+                 const __tag_TAVO_MEDIA_INFO& album) {
+  copy_text(record.path, track.path);
+  copy_text(record.title, track.title);
+  copy_text(record.artist, track.artist);
+  copy_text(record.composer, track.composer[0] ? track.composer : album.composer);
+  copy_text(record.comment, track.comment);
+  copy_text(record.album, album.title);
+  copy_text(record.album_artist, album.artist);
+  copy_text(record.genre, album.genre);
+  record.track = track.track;
+  record.year = album.year;
+  record.duration = track.duration;
 }
 
 /// What the index knows of an audio file's length.
@@ -144,9 +210,8 @@ int MediaInfoCueParser::CalDuration(std::string endPos, int trackIndex) {
   if (trackIndex < 0 || static_cast<std::size_t>(trackIndex) >= tracks.size()) return 0;
   if (endPos.empty()) return CalDurationOfLast(trackIndex);
   auto& track = tracks[static_cast<std::size_t>(trackIndex)];
-  if (!postgap.empty()) CalPosition(endPos, postgap, "-");
-  track.duration = mediidx::seconds(mediidx::subtract_frames(
-      mediidx::frames_from_position(endPos), mediidx::frames_from_position(track.comment)));
+  track.duration =
+      mediidx::duration_until(mediidx::frames_from_position(endPos), postgap, track.comment);
   return 1;
 }
 
@@ -164,82 +229,74 @@ int MediaInfoCueParser::CalDurationOfLast(int trackIndex) {
     PersonalLibraryDBClose();
   }
   if (end.failed) return 0;
-  if (end.frames) return CalDuration(mediidx::position_from_frames(*end.frames), trackIndex);
   // Callers know a file that is not indexed by a duration of minus the track's start.
   auto& track = tracks[static_cast<std::size_t>(trackIndex)];
-  const auto start = mediidx::frames_from_position(track.comment);
-  const auto gap = mediidx::frames_from_position(postgap);
-  track.duration =
-      mediidx::seconds(mediidx::subtract_frames(mediidx::subtract_frames(0, start), gap));
+  track.duration = mediidx::duration_until(end.frames.value_or(0), postgap, track.comment);
   return 1;
 }
 
 int MediaInfoCueParser::OutputResultLists(_PLAYLIST_REC** out) {
   if (CalDuration("", static_cast<int>(tracks.size()) - 1) == 0) return 0;
   _PLAYLIST_REC** end = out;
-  for (auto& track : tracks) {
+  for (const auto& track : tracks) {
     if (!BlTAVOIndexIsMusicFile(track.path)) continue;
-    std::memcpy(track.album, albumInfo.title, sizeof(track.album));
-    std::memcpy(track.album_artist, albumInfo.artist, sizeof(track.album_artist));
-    if (!track.composer[0]) std::memcpy(track.composer, albumInfo.composer, sizeof(track.composer));
-    std::memcpy(track.genre, albumInfo.genre, sizeof(track.genre));
-    track.year = albumInfo.year;
     auto* node = static_cast<_PLAYLIST_REC*>(std::calloc(1, sizeof(_PLAYLIST_REC)));
     if (!node) {
       kCueLog.colon(452, "Failed to calloc.");
       return 0;
     }
-    node->info = track;
+    mediidx::fill_record(node->info, track, albumInfo);
     *end = node;
     end = &node->next;
   }
   return 1;
 }
 
-int MediaInfoCueParser::ParseFile(const Tokens& tokens, const char* cuePath) {
+int MediaInfoCueParser::ParseFile(std::string_view text, const char* cuePath) {
   const auto count = static_cast<int>(tracks.size());
   if (count > 0 && tracks.back().comment[0] && CalDuration("", count - 1) == 0) return 0;
-  GetString(currentFile, tokens, 1, static_cast<int>(tokens.size()) - 2);
   const std::string_view sheet(cuePath);
-  currentFile.insert(0, sheet.substr(0, sheet.rfind('/') + 1));
+  std::string room;
+  currentFile = sheet.substr(0, sheet.rfind('/') + 1);
+  // The last word is the file's type.
+  currentFile += mediidx::value_of(mediidx::without_last_word(text), room);
   return 1;
 }
 
-void MediaInfoCueParser::ParseTrack(const Tokens& tokens) {
+void MediaInfoCueParser::ParseTrack(std::string_view number) {
+  // Records are large to move, and what is not used of their memory is never touched.
+  constexpr std::size_t kTracksOfADisc = 99;
+  if (tracks.empty()) tracks.reserve(kTracksOfADisc);
   tracks.emplace_back();
-  tracks.back().track = static_cast<int>(std::strtol(tokens[1].c_str(), nullptr, 10));
+  tracks.back().track = static_cast<int>(mediidx::leading_number(number));
   isCueSheet = true;
   pregap.clear();
 }
 
-int MediaInfoCueParser::ParseIndex(const Tokens& tokens) {
-  if (tracks.empty()) return 1;
+void MediaInfoCueParser::ParseIndex(std::string_view number, std::string_view position) {
+  if (tracks.empty()) return;
   if (tracks.size() > 1) {
     // A predecessor in another file ends with that file, not here.
-    const auto previous = tracks.size() - 2;
-    const std::string_view path = tracks[previous].path;
-    if ((path.empty() || path == currentFile) &&
-        CalDuration(tokens[2], static_cast<int>(previous)) == 0) {
-      return 0;
+    auto& previous = tracks[tracks.size() - 2];
+    if (!previous.path[0] || previous.path == currentFile) {
+      previous.duration = mediidx::duration_until(mediidx::frames_from_position(position), postgap,
+                                                  previous.comment);
     }
   }
-  if (std::strtol(tokens[1].c_str(), nullptr, 10) != 1) return 1;
-  auto position = tokens[2];
+  if (mediidx::leading_number(number) != 1) return;
+  std::string start(position);
   auto& track = tracks.back();
   copy_text(std::span(track.path).first<MEDIIDX_PATH_SIZE>(), currentFile);
-  if (!pregap.empty()) CalPosition(position, pregap, "+");
-  copy_text(track.comment, position);
+  if (!pregap.empty()) CalPosition(start, pregap, "+");
+  copy_text(track.comment, start);
   postgap.clear();
-  return 1;
 }
 
-void MediaInfoCueParser::ParseRemark(const Tokens& tokens) {
-  std::string value;
-  GetString(value, tokens, 2, static_cast<int>(tokens.size()) - 2);
-  if (tokens[1] == "GENRE") copy_text(albumInfo.genre, value);
-  if (tokens[1] == "DATE") {
-    albumInfo.year = static_cast<int>(std::strtol(value.c_str(), nullptr, 10));
-  }
+void MediaInfoCueParser::ParseRemark(std::string_view key, std::string_view text) {
+  std::string room;
+  const auto value = mediidx::value_of(text, room);
+  if (key == "GENRE") copy_text(albumInfo.genre, value);
+  if (key == "DATE") albumInfo.year = static_cast<int>(mediidx::leading_number(value));
 }
 
 char (&MediaInfoCueParser::TextField(
@@ -249,21 +306,31 @@ char (&MediaInfoCueParser::TextField(
 }
 
 int MediaInfoCueParser::ParseCommand(std::string line, const char* cuePath) {
-  const auto tokens = mediidx::split_at_white_space(line);
-  const auto count = tokens.size();
-  if (count < 2) return 1;  // no command does anything without a value
-  const auto& command = tokens[0];
-  if (command == "FILE") return ParseFile(tokens, cuePath);
+  return ParseLine(line, cuePath);
+}
+
+int mediidx::parse_cue_line(MediaInfoCueParser& parser, std::string_view line,
+                            const char* cue_path) {
+  return parser.ParseLine(line, cue_path);
+}
+
+int MediaInfoCueParser::ParseLine(std::string_view line, const char* cuePath) {
+  auto text = mediidx::trimmed(line);
+  const auto command = mediidx::take_word(text);
+  if (text.empty()) return 1;  // no command does anything without a value
+  if (command == "FILE") return ParseFile(text, cuePath);
   if (command == "TRACK") {
-    ParseTrack(tokens);
+    ParseTrack(mediidx::take_word(text));
   } else if (command == "INDEX") {
-    if (count > 2) return ParseIndex(tokens);
+    const auto number = mediidx::take_word(text);
+    if (!text.empty()) ParseIndex(number, mediidx::take_word(text));
   } else if (command == "PREGAP") {
-    pregap = tokens[1];
+    pregap = mediidx::take_word(text);
   } else if (command == "POSTGAP") {
-    postgap = tokens[1];
+    postgap = mediidx::take_word(text);
   } else if (command == "REM") {
-    if (count > 2) ParseRemark(tokens);
+    const auto key = mediidx::take_word(text);
+    if (!text.empty()) ParseRemark(key, text);
   } else {
     struct TextCommand {
       std::string_view name;
@@ -274,11 +341,10 @@ int MediaInfoCueParser::ParseCommand(std::string line, const char* cuePath) {
         TextCommand{"PERFORMER", &__tag_TAVO_MEDIA_INFO::artist},
         TextCommand{"SONGWRITER", &__tag_TAVO_MEDIA_INFO::composer},
     };
-    for (const auto& text : kTextCommands) {
-      if (text.name != command) continue;
-      std::string value;
-      GetString(value, tokens, 1, static_cast<int>(count) - 1);
-      copy_text(TextField(text.field), value);
+    for (const auto& known : kTextCommands) {
+      if (known.name != command) continue;
+      std::string room;
+      copy_text(TextField(known.field), mediidx::value_of(text, room));
     }
   }
   return 1;

@@ -3,16 +3,29 @@
 #include "playlist/cue_position.h"
 
 #include <array>
-#include <cstdlib>
+#include <charconv>
+#include <limits>
 
 namespace mediidx {
 namespace {
 
+constexpr bool is_white_space(char c) { return c == ' ' || (c >= '\t' && c <= '\r'); }
+
 std::uint32_t number(std::string_view text) {
-  return static_cast<std::uint32_t>(std::strtol(std::string(text).c_str(), nullptr, 10));
+  return static_cast<std::uint32_t>(leading_number(text));
 }
 
 }  // namespace
+
+std::int64_t leading_number(std::string_view text) {
+  using Range = std::numeric_limits<std::int64_t>;
+  while (!text.empty() && is_white_space(text.front())) text.remove_prefix(1);
+  if (text.starts_with('+') && !text.starts_with("+-")) text.remove_prefix(1);
+  std::int64_t value = 0;
+  const auto read = std::from_chars(text.data(), text.data() + text.size(), value);
+  if (read.ec != std::errc::result_out_of_range) return value;
+  return text.starts_with('-') ? Range::min() : Range::max();
+}
 
 std::int32_t frames_from_position(std::string_view position) {
   const auto first = position.find(':');

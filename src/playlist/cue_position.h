@@ -14,6 +14,10 @@ namespace mediidx {
 inline constexpr std::int32_t kFramesPerSecond = 75;
 inline constexpr std::int32_t kFramesPerMinute = 60 * kFramesPerSecond;
 
+/// The number that a text begins with, as strtol reads it: behind white space and with a sign; 0
+/// when there is none, the nearest there is when it is too large.
+std::int64_t leading_number(std::string_view text);
+
 /// "mm:ss:ff" as frames. Minutes end at the first ":", frames begin after the last, so with one ":"
 /// the text after it counts as seconds and as frames, and without one the text counts three times.
 std::int32_t frames_from_position(std::string_view position);

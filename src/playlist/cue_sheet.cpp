@@ -19,7 +19,7 @@ using LineBuffer = std::array<char, 1024>;
 
 bool parse_line(MediaInfoCueParser& parser, const char* line, const char* cue_path, int log_line) {
   if (auto* durations = CueDurations::current()) durations->keep_line(line);
-  if (parser.ParseCommand(line, cue_path) != 0) return true;
+  if (parse_cue_line(parser, line, cue_path) != 0) return true;
   kCueLog.colon(log_line, "Failed to parse command [%s]", line);
   return false;
 }

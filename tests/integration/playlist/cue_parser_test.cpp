@@ -6,7 +6,10 @@
 #include <chrono>
 #include <cstdlib>
 #include <memory>
+#include <random>
+#include <sstream>
 #include <string>
+#include <string_view>
 #include <thread>
 #include <vector>
 
@@ -513,6 +516,43 @@ TEST(CueParser, RebuildsAValueFromItsTokens) {
   EXPECT_EQ(value, "");
   parser.GetString(value, {"\"a\""}, 0, 9);
   EXPECT_EQ(value, "a");
+}
+
+/// The words of a line, as a stream takes them from it.
+std::vector<std::string> words_of(const std::string& line) {
+  std::istringstream in(line);
+  std::vector<std::string> words;
+  for (std::string word; in >> word;) words.push_back(word);
+  return words;
+}
+
+TEST(CueParser, ReadsEveryLineAsItsTokensGiveIt) {
+  std::mt19937 numbers(7);
+  constexpr std::string_view kLetters = "ab\"\" \t  \v\f\r\n1";
+  for (int i = 0; i < 20000; ++i) {
+    std::string text;
+    for (auto length = numbers() % 12; length > 0; --length) {
+      text += kLetters[numbers() % kLetters.size()];
+    }
+    for (const std::string command : {"TITLE ", "REM GENRE ", "FILE "}) {
+      MediaInfoCueParser parser;
+      const auto& fields = reinterpret_cast<const ParserFields&>(parser);
+      ASSERT_EQ(parser.ParseCommand(" " + command + text, "/m/a.cue"), 1);
+      const auto words = words_of(command + text);
+      const auto count = static_cast<int>(words.size());
+      std::string expected;
+      if (command == "TITLE ") {
+        parser.GetString(expected, words, 1, count - 1);
+        ASSERT_EQ(fields.album.title, expected) << text;
+      } else if (command == "FILE ") {
+        parser.GetString(expected, words, 1, count - 2);
+        ASSERT_EQ(fields.current_file, count < 2 ? "" : "/m/" + expected) << text;
+      } else {
+        parser.GetString(expected, words, 2, count - 2);
+        ASSERT_EQ(fields.album.genre, expected) << text;
+      }
+    }
+  }
 }
 
 TEST(CueParser, AddsAndSubtractsPositions) {

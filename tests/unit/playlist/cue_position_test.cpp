@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 
+#include <cstdlib>
 #include <limits>
 #include <string>
 
@@ -42,6 +43,34 @@ INSTANTIATE_TEST_SUITE_P(
                     PositionCase{"NoColonCountsInEveryPart", "7", 7 * 4576},
                     PositionCase{"Empty", "", 0}, PositionCase{"Words", "a:b:c", 0}),
     [](const auto& test) { return test.param.name; });
+
+TEST(LeadingNumber, IsThatOfStrtol) {
+  for (const std::string text : {"",
+                                 " ",
+                                 "7",
+                                 "007",
+                                 "-7",
+                                 "+7",
+                                 "+-7",
+                                 "-+7",
+                                 "--7",
+                                 "++7",
+                                 "+",
+                                 "-",
+                                 " \t\n\v\f\r7",
+                                 "7x",
+                                 "x7",
+                                 "- 7",
+                                 "+ 7",
+                                 "0x10",
+                                 "9223372036854775807",
+                                 "9223372036854775808",
+                                 "-9223372036854775808",
+                                 "-9223372036854775809",
+                                 "+9223372036854775808"}) {
+    EXPECT_EQ(mediidx::leading_number(text), std::strtol(text.c_str(), nullptr, 10)) << text;
+  }
+}
 
 TEST(CuePosition, OfHugeNumbersWraps) {
   EXPECT_EQ(frames_from_position("99999999999999999999:0:0"),

@@ -32,10 +32,9 @@ bool is_library(const void* address) {
 
 /// One file a program, begun anew by each run; a text that it holds already is not written again.
 /// Texts end with a NUL byte.
-void keep(const std::string& sql) {
-  static const char* folder = std::getenv("MEDIIDX_JOURNAL");
+void keep(const char* folder, const std::string& sql) {
   static std::set<std::string> kept;
-  if (!folder || !kept.insert(sql).second) return;
+  if (!kept.insert(sql).second) return;
   static std::ofstream out(
       std::string(folder) + "/" + program_invocation_short_name + ".statements",
       std::ios::binary | std::ios::trunc);
@@ -48,7 +47,8 @@ bool g_selecting = false;
 /// Notes a text that was sent. The checks of every statement are to see what the library means to
 /// send: neither what a test sends itself nor what it breaks to make the server refuse it.
 void note(const char* sql, int result, const void* caller) {
-  if (result != -1 && is_library(caller)) keep(sql);
+  static const char* folder = std::getenv("MEDIIDX_JOURNAL");
+  if (folder && result != -1 && is_library(caller)) keep(folder, sql);
 }
 
 template <class Call>

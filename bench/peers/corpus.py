@@ -54,6 +54,10 @@ class Corpus:
                             if path.suffix in (".mp3", ".flac", ".m4a", ".ogg"))
         if len(self.songs) != audio_files:
             raise RuntimeError(f"{self.folder} is not whole; remove it")
+        # The one that is changed for a while.
+        self.song = next(path for path in self.songs[audio_files // 2:] if path.suffix == ".mp3")
+        self.original = self.song.read_bytes()
+        self.dated = self.song.stat().st_mtime
 
     def bytes(self):
         return sum(song.stat().st_size for song in self.songs)
@@ -67,11 +71,14 @@ class Corpus:
 
     def change_one(self):
         """One tagged song gets a title that no other has, which is returned."""
-        song = next(path for path in self.songs[len(self.songs) // 2:] if path.suffix == ".mp3")
         self.changes += 1
-        title = f"Changed {os.getpid()} {self.changes}"
-        before = song.stat().st_mtime
-        subprocess.run([self.program, "retitle", song, title], check=True)
+        title = f"Changed {self.changes}"
+        before = self.song.stat().st_mtime
+        subprocess.run([self.program, "retitle", self.song, title], check=True)
         # Some keep whole seconds.
-        os.utime(song, (before + 60, before + 60))
+        os.utime(self.song, (before + 60, before + 60))
         return title
+
+    def restore(self):
+        self.song.write_bytes(self.original)
+        os.utime(self.song, (self.dated, self.dated))

@@ -20,7 +20,7 @@ PR_SET_CHILD_SUBREAPER = 36
 class Cost:
     seconds: float
     cpu: float  # Of every process involved.
-    others: float  # The part of the machine's processors that other programs took meanwhile.
+    others: float  # Processor seconds that other programs took meanwhile.
 
 
 @dataclasses.dataclass
@@ -85,13 +85,11 @@ class Watch:
         self.cpu_before = cpu()
         self.begin = time.perf_counter()
 
-    def cost(self, end=None):
-        seconds = (end or time.perf_counter()) - self.begin
+    def cost(self):
+        seconds = time.perf_counter() - self.begin
         cpu = self.cpu() - self.cpu_before
         own = time.process_time() - self.own_before
-        others = (busy_seconds() - self.busy_before - cpu - own) / (
-            (time.perf_counter() - self.begin) * os.cpu_count())
-        return Cost(seconds, cpu, max(0.0, others))
+        return Cost(seconds, cpu, busy_seconds() - self.busy_before - cpu - own)
 
 
 def cpu_of_ended():
@@ -105,15 +103,20 @@ def run(words, **options):
     done = subprocess.run([str(word) for word in words], check=False, text=True,
                           stdout=subprocess.PIPE, stderr=subprocess.PIPE,
                           **({"stdin": subprocess.DEVNULL} | options))
-    end = time.perf_counter()
+    wait_for_orphans()
+    cost = watch.cost()
     if done.returncode != 0:
         raise RuntimeError(f"{' '.join(map(str, words))}: {done.stderr or done.stdout}")
+    return done.stdout, cost
+
+
+def wait_for_orphans():
+    """Nothing else may have been started that still runs."""
     try:
         while True:
             os.waitpid(-1, 0)
     except ChildProcessError:
         pass
-    return done.stdout, watch.cost(end)
 
 
 def memory_of(pid):
@@ -139,6 +142,7 @@ class MemoryWatch(threading.Thread):
         try:
             while not self.done.wait(self.INTERVAL):
                 self.sample()
+            self.sample()
         except OSError as error:
             self.failure = error
 

@@ -14,6 +14,7 @@ OURS = "mediidx"
 SERVERS = ("mediidx", "MPD", "MiniDLNA")
 ALL = SERVERS + ("TagLib", "COPY")
 PACKAGES = {"MPD": "mpd", "MiniDLNA": "minidlna", "TagLib": "libtag1v5", "COPY": "postgresql-15"}
+NO_COUNTERS = ("real_time", "cpu_time")
 QUIET = 0.05  # Others may take this part of the machine before the figures say less.
 
 
@@ -128,15 +129,21 @@ def goals(results, files):
     ])
 
 
-def unit_of(case):
-    """A time of Google Benchmark, in microseconds."""
+def microseconds(case):
     return case["real_time"] * {"ns": 1e-3, "us": 1, "ms": 1e3, "s": 1e6}[case["time_unit"]]
 
 
+def counters(case):
+    """What a program counted besides the time."""
+    return ", ".join(f"{name.replace('_', ' ')} {value:.3g}" for name, value in case.items()
+                     if name not in NO_COUNTERS and isinstance(value, float))
+
+
 def inner_loops(loops):
-    rows = [[program.removeprefix("bench_"), f"`{case['name']}`", digits(unit_of(case))]
-            for program, cases in loops for case in cases if "error_occurred" not in case]
-    return table(["Program", "Case", "µs"], rows)
+    rows = [[program.removeprefix("bench_"), f"`{case['name']}`", digits(microseconds(case)),
+             counters(case)]
+            for program, cases in loops for case in cases]
+    return table(["Program", "Case", "µs", "Counted"], rows)
 
 
 def processor():
@@ -159,10 +166,10 @@ def conditions(results, corpus):
             f"The {corpus.audio_files:,} audio files have {digits(corpus.bytes() / 1e6)} MB, all in "
             "the page cache. ")
     if others > QUIET:
-        return text + ("**The machine was not quiet: in some rounds other programs took "
+        return text + ("**The machine was not quiet: other programs took "
                        f"{others:.0%} of its processors.** Take ratios, not times, and those with "
                        "care.")
-    return text + f"Other programs took {others:.1%} of the processors at most."
+    return text + f"Other programs took {others:.1%} of the processors."
 
 
 def markdown(results, corpus, large, loops):

@@ -5,12 +5,14 @@
 
 SIZE audio files are indexed, scanned again, and again when one of them has changed; five times as
 many are scanned again. Everybody takes turns, in an order that moves on by one each round. Times
-are medians of the rounds. Memory is watched in a round of its own, for that takes time. At the end
-stand the programs bench_* of the build folder. Prints the results; REPORT gets them between two
+are medians of the rounds. Memory is watched in a round of its own, for that takes time. The programs
+bench_* of the build folder are run too. Prints the results; REPORT gets them between two
 marks, and PLOT a picture of them.
 """
 
+import dataclasses
 import json
+import os
 import pathlib
 import statistics
 import subprocess
@@ -35,9 +37,7 @@ def turns(members, round_number):
 
 
 def median(costs):
-    return processes.Cost(statistics.median(cost.seconds for cost in costs),
-                          statistics.median(cost.cpu for cost in costs),
-                          statistics.median(cost.others for cost in costs))
+    return processes.Cost(*map(statistics.median, zip(*map(dataclasses.astuple, costs))))
 
 
 def check(holds, system, expected, what):
@@ -46,7 +46,7 @@ def check(holds, system, expected, what):
 
 
 class Results:
-    """Costs by what was done and by whom; memory likewise."""
+    """The costs of each round, by what was done and by whom; memory likewise, of one round."""
 
     def __init__(self):
         self.costs = {}
@@ -60,8 +60,10 @@ class Results:
         return median(costs) if costs else None
 
     def others(self):
-        """The most that others took in any of the medians."""
-        return max(median(costs).others for costs in self.costs.values())
+        """The part of the processors that other programs took."""
+        costs = [cost for rounds in self.costs.values() for cost in rounds]
+        return max(0.0, sum(cost.others for cost in costs) /
+                   (sum(cost.seconds for cost in costs) * os.cpu_count()))
 
 
 def index_and_rescan(system, corpus, results):
@@ -138,11 +140,13 @@ def compare_everything(servers, results):
 def inner_loops(build, quick):
     """What the programs of Google Benchmark found: their name, and their cases."""
     found = []
+    shortened = ["--benchmark_min_time=0.01"] if quick else []
     for program in sorted((build / "bin").glob("bench_*")):
         say(program.name)
-        shortened = ["--benchmark_min_time=0.01"] if quick else []
-        output, _ = processes.run([program, "--benchmark_format=json", *shortened])
-        found.append((program.name, json.loads(output)["benchmarks"]))
+        output = build / f"{program.name}.json"
+        processes.run([program, f"--benchmark_out={output}", "--benchmark_out_format=json",
+                       *shortened])
+        found.append((program.name, json.loads(output.read_text())["benchmarks"]))
     return found
 
 
@@ -158,6 +162,7 @@ def main():
     processes.become_subreaper()
     # The server of root runs as another user, who has to come this far.
     work = systems.fresh(build / "peers")
+    loops = inner_loops(build, quick=size < 10000)
     say("the corpus")
     corpus = Corpus(program, build, size)
     large = Corpus(program, build, LARGE * size)
@@ -182,7 +187,7 @@ def main():
     finally:
         for server in servers + of_everything + of_large:
             server.stop()
-    loops = inner_loops(build, quick=size < 10000)
+        corpus.restore()
 
     text = report.markdown(results, corpus, large, loops)
     print(text)

@@ -45,16 +45,22 @@ def stat_fields(pid):
         return None
 
 
+def children(pid):
+    """Empty for one that is gone."""
+    found = []
+    try:
+        for task in (PROC / str(pid) / "task").iterdir():
+            found += map(int, (task / "children").read_text().split())
+    except (FileNotFoundError, ProcessLookupError):
+        pass
+    return found
+
+
 def descendants(root):
     """The processes below `root`, and it."""
-    children = {}
-    for pid in (int(entry.name) for entry in PROC.iterdir() if entry.name.isdigit()):
-        fields = stat_fields(pid)
-        if fields:
-            children.setdefault(int(fields[1]), []).append(pid)
     found = [root]
     for pid in found:
-        found += children.get(pid, [])
+        found += children(pid)
     return found
 
 
@@ -153,7 +159,7 @@ class MemoryWatch(threading.Thread):
                 name = (PROC / str(pid) / "comm").read_text().strip()
                 size = memory_of(pid)
             except (FileNotFoundError, ProcessLookupError):
-                continue
+                continue  # It has ended.
             everything += size
             without_server += 0 if name == "postgres" else size
         self.peak.everything = max(self.peak.everything, everything)

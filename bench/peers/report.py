@@ -173,14 +173,15 @@ def conditions(results, corpus):
 
 
 def markdown(results, corpus, large, loops):
-    return "\n\n".join([
+    parts = [
         conditions(results, corpus),
         "In brackets: how many times that of mediidx.",
         comparison(results, corpus, large),
         "![First index, re-scan and memory as bars](performance.svg)",
-        goals(results, corpus.audio_files),
-        "### Inner loops",
-        inner_loops(loops)]) + "\n"
+        goals(results, corpus.audio_files)]
+    if loops:
+        parts += ["### Inner loops", inner_loops(loops)]
+    return "\n\n".join(parts) + "\n"
 
 
 def publish(text, results, report, plot):

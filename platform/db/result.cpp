@@ -23,14 +23,7 @@ std::string folded(std::string_view name) {
 
 }  // namespace
 
-Result::Result(OwnedRows rows) : rows_(std::move(rows)) {
-  const int count = PQnfields(rows_.get());
-  columns_.reserve(static_cast<std::size_t>(count));
-  // Of several columns of one name the first keeps its place.
-  for (int column = 0; column < count; ++column) {
-    columns_.try_emplace(PQfname(rows_.get(), column), column);
-  }
-}
+Result::Result(OwnedRows rows) : rows_(std::move(rows)) {}
 
 std::uint32_t Result::next() { return next_ < size() ? static_cast<std::uint32_t>(++next_) : 0; }
 
@@ -40,7 +33,17 @@ bool Result::set_next(std::uint32_t row) {
   return true;
 }
 
-std::optional<int> Result::find(std::string_view column) const {
+void Result::number_columns() {
+  const int count = PQnfields(rows_.get());
+  columns_.reserve(static_cast<std::size_t>(count));
+  // Of several columns of one name the first keeps its place.
+  for (int column = 0; column < count; ++column) {
+    columns_.try_emplace(PQfname(rows_.get(), column), column);
+  }
+}
+
+std::optional<int> Result::find(std::string_view column) {
+  if (columns_.empty()) number_columns();
   auto found = columns_.find(column);
   if (found == columns_.end() && std::ranges::any_of(column, is_capital)) {
     found = columns_.find(folded(column));
@@ -48,7 +51,7 @@ std::optional<int> Result::find(std::string_view column) const {
   return found == columns_.end() ? std::nullopt : std::optional(found->second);
 }
 
-const char* Result::field(std::uint32_t cursor, std::string_view column) const {
+const char* Result::field(std::uint32_t cursor, std::string_view column) {
   if (cursor == 0 || cursor > static_cast<std::uint32_t>(size())) return nullptr;
   const auto number = find(column);
   const int row = static_cast<int>(cursor - 1);

@@ -33,10 +33,12 @@ class Result {
   /// A field of the row that a cursor stands for; null when there is no such row or column, and
   /// for SQL null. A name that no column has stands for the one that the server makes of it, as in
   /// a statement: "resolutionX" for resolutionx.
-  const char* field(std::uint32_t cursor, std::string_view column) const;
+  const char* field(std::uint32_t cursor, std::string_view column);
 
  private:
-  std::optional<int> find(std::string_view column) const;
+  /// At the first look-up: most results of a write are only counted.
+  void number_columns();
+  std::optional<int> find(std::string_view column);
 
   OwnedRows rows_;
   std::unordered_map<std::string_view, int> columns_;  ///< By the names in `rows_`.

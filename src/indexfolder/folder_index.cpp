@@ -52,6 +52,18 @@ struct TextHash : std::hash<std::string_view> {
   using is_transparent = void;
 };
 
+/// From the shortest to the longest: most beginnings of a path need no look-up.
+struct Lengths {
+  std::size_t shortest = std::string::npos;
+  std::size_t longest = 0;
+
+  void take_in(std::size_t length) {
+    shortest = std::min(shortest, length);
+    longest = std::max(longest, length);
+  }
+  bool hold(std::size_t length) const { return length >= shortest && length <= longest; }
+};
+
 class FolderIndex {
  public:
   /// Whether the copy is the one that the index was built from, as far as can be told at once.
@@ -64,9 +76,13 @@ class FolderIndex {
   bool build() {
     forget();
     first_of_path_.clear();
+    lengths_ = {};
     Json::ArrayIndex position = 0;
     for (const auto& entry : gIndexFolderConf) {
-      if (const auto path = find_entry_path(entry)) first_of_path_.emplace(*path, position);
+      if (const auto path = find_entry_path(entry)) {
+        first_of_path_.emplace(*path, position);
+        lengths_.take_in(path->size());
+      }
       ++position;
     }
     size_ = gIndexFolderConf.size();
@@ -79,6 +95,7 @@ class FolderIndex {
   void forget() { mark_ = 0; }
 
   Json::ArrayIndex position_of(std::string_view path) const {
+    if (!lengths_.hold(path.size())) return kNone;
     const auto found = first_of_path_.find(path);
     return found == first_of_path_.end() ? kNone : found->second;
   }
@@ -101,6 +118,7 @@ class FolderIndex {
   }
 
   std::unordered_map<std::string, Json::ArrayIndex, TextHash, std::equal_to<>> first_of_path_;
+  Lengths lengths_;
   Json::ArrayIndex size_ = 0;
   /// Stands where the last entry keeps the end of its text in the file, which nobody asks for: an
   /// entry that takes its place has none, or, from a file, one above zero. Entries that a caller

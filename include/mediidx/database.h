@@ -119,7 +119,7 @@ MEDIIDX_EXPORT int MediaInfoAudioRGMetadataDBSave(const float* gains, uint32_t t
 /// Marks rows online (`online` not 0) or offline: all rows with a null or empty path, otherwise
 /// those of this path, or, with `prefixMatch`, whose path begins with it (no slash is added).
 MEDIIDX_EXPORT void MediaInfoDBSetOnline(const char* path, int prefixMatch, int online);
-/// Deletes offline rows: all, or only those below /volumeN/<shareName>/.
+/// Deletes offline rows: all, or only those below "/volumeN/", the share's name and a slash.
 MEDIIDX_EXPORT void MediaInfoDBUUIDDropOffline(const char* shareName);
 /// Empties the database, personal libraries and transcoded copies apart.
 MEDIIDX_EXPORT int MediaInfoDBDeleteAll(void);

@@ -79,7 +79,7 @@ MEDIIDX_EXPORT int WriteDefaultConf();
 MEDIIDX_EXPORT Json::Value IndexFolderConfLoad();
 MEDIIDX_EXPORT Json::Value createRule(std::string name, std::string path, bool photo, bool music,
                                       bool video, bool isDefault);
-/// The share-relative folder behind /var/services/<kind>, or an empty text.
+/// The share-relative folder behind "/var/services/" and the kind, or an empty text.
 MEDIIDX_EXPORT std::string getDefaultSharePath(const char* kind);
 /// The entry of that folder (with `useFallback` of "/<kind>" when there is none), or null.
 MEDIIDX_EXPORT Json::Value createDefaultShareRule(const char* kind, int useFallback);

@@ -169,6 +169,7 @@ const Verb kVerbs[] = {
      {},
      run_search},
     {"stats", "", "count what is in the index", 0, 0, kJsonOption, {}, run_stats},
+    {"report", "FILE", "write a page of charts about the index", 1, 1, {}, {}, run_report},
     {"playlist show",
      "FILE",
      "show a playlist's entries and which of them the index knows",

@@ -44,6 +44,7 @@ int run_list(const Arguments& arguments);
 int run_show(const Arguments& arguments);
 int run_search(const Arguments& arguments);
 int run_stats(const Arguments& arguments);
+int run_report(const Arguments& arguments);
 int run_playlist_show(const Arguments& arguments);
 int run_cue_show(const Arguments& arguments);
 int run_volume_offline(const Arguments& arguments);

@@ -27,7 +27,9 @@ MEDIIDX_EXPORT int TAVOMediaIndexReindexUpdate(struct __tag_TAVO_MEDIA_INFO* inf
 /// and in as many round trips to the database for a thousand records as for one. 0, or -1 when any
 /// failed. `results` (null when of no interest) receives one result a record, as TAVOMediaIndexAdd
 /// gives it. The texts of the records are trimmed; a music add sets their ids. Where the database
-/// refuses the files together, they are added one by one, so that only the bad ones fail.
+/// refuses the files together, they are added one by one, so that only the bad ones fail. Within a
+/// transaction that the caller has begun on the shared connection they become part of that, which
+/// the first bad one ends.
 MEDIIDX_EXPORT int TAVOMediaIndexAddMany(struct __tag_TAVO_MEDIA_INFO* records, unsigned count,
                                          MEDIA_TABLE_TYPE type, int* results);
 /// Removes a file that is gone; -1 while it still exists.

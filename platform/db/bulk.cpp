@@ -52,3 +52,7 @@ extern "C" int TAVODBCopy(tavodb_connection* conn, const char* sql, const char* 
     return conn->copy(sql, {rows, length}) ? 0 : -1;
   });
 }
+
+extern "C" int TAVODBInTransaction(tavodb_connection* conn) {
+  return conn && conn->in_transaction() ? 1 : 0;
+}

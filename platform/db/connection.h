@@ -38,6 +38,8 @@ class Connection {
   /// The same for "COPY … FROM STDIN" and its rows; false when it failed.
   bool copy(const std::string& statement, std::string_view rows);
 
+  /// As the last statement left it.
+  bool in_transaction() const { return in_transaction_; }
   /// Rows that the last statement touched or returned; -1 when it failed.
   int affected_rows() const { return affected_rows_; }
   void set_affected_rows(int count) { affected_rows_ = count; }

@@ -22,6 +22,9 @@ TAVODB_EXPORT int TAVODBExecuteParams(struct tavodb_connection* conn, const char
 /// written, or none.
 TAVODB_EXPORT int TAVODBCopy(struct tavodb_connection* conn, const char* sql, const char* rows,
                              size_t length);
+/// 1 while the connection is within a transaction that somebody began, also one that has failed;
+/// 0 otherwise.
+TAVODB_EXPORT int TAVODBInTransaction(struct tavodb_connection* conn);
 
 #ifdef __cplusplus
 }

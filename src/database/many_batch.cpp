@@ -12,7 +12,8 @@ namespace {
 constexpr int kNotExecuted = 700;
 
 // A batch names its rows, and an index finds each. The planner, left to itself, reads whole tables
-// where it takes them for small, as it does until a new library is analysed.
+// where it takes them for small, as it does until a new library is analysed. Within the caller's
+// transaction this holds until that ends.
 constexpr const char* kUseIndexes =
     "SELECT set_config('enable_seqscan', 'off', true), set_config('enable_hashjoin', 'off', true), "
     "set_config('enable_mergejoin', 'off', true)";
@@ -75,9 +76,9 @@ void CopyRows::append(const Text& value) {
   append(std::nullopt);
 }
 
-Batch::Batch() : conn_(MediaDBConnGet()) {
+Batch::Batch() : conn_(MediaDBConnGet()), is_part_(TAVODBInTransaction(conn_) == 1) {
   if (!conn_) throw GivenUp("no connection");
-  run("BEGIN", {});
+  run(is_part_ ? "SAVEPOINT mediidx_batch" : "BEGIN", {});
   open_ = true;
   try {
     run(kUseIndexes, {});
@@ -92,7 +93,11 @@ Batch::~Batch() {
 }
 
 // A connection that was lost has nothing left to undo.
-void Batch::undo() { TAVODBExecute(conn_, "ROLLBACK", nullptr); }
+void Batch::undo() {
+  constexpr const char* kUndoPart =
+      "ROLLBACK TO SAVEPOINT mediidx_batch; RELEASE SAVEPOINT mediidx_batch";
+  TAVODBExecute(conn_, is_part_ ? kUndoPart : "ROLLBACK", nullptr);
+}
 
 void Batch::run(const char* sql, std::initializer_list<const char*> values) { select(sql, values); }
 
@@ -114,7 +119,7 @@ void Batch::copy(const CopyRows& rows) {
 }
 
 void Batch::commit() {
-  run("COMMIT", {});
+  run(is_part_ ? "RELEASE SAVEPOINT mediidx_batch" : "COMMIT", {});
   open_ = false;
 }
 

@@ -85,8 +85,8 @@ class CopyRows {
   std::string text_;
 };
 
-/// A transaction on the shared connection, undone unless it is committed. Failures are logged, and
-/// thrown as GivenUp.
+/// A transaction on the shared connection, or a part of the caller's that is open there; undone
+/// unless it is committed. Failures are logged, and thrown as GivenUp.
 class Batch {
  public:
   Batch();
@@ -108,6 +108,7 @@ class Batch {
   void undo();
 
   tavodb_connection* conn_;
+  bool is_part_;  ///< Of the caller's transaction.
   bool open_ = false;
 };
 

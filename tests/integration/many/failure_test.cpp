@@ -2,8 +2,11 @@
 // SPDX-License-Identifier: MIT
 
 // Batches that cannot be saved as a whole.
+#include <tavodb.h>
+
 #include <new>
 
+#include "mediidx/database.h"
 #include "twin_test.h"
 
 namespace mediidx::test {
@@ -126,6 +129,35 @@ TEST_F(FailingBatches, SayWhyInTheLog) {
 
 TEST_F(FailingBatches, AreAddedOneByOneWhicheverStatementFails) {
   expect_whole_whatever_fails([] { return false; });
+}
+
+TEST_F(FailingBatches, AreUndoneWithinTheCallersTransaction) {
+  auto earlier = record(shared("earlier.mp4"));
+  auto all = records(".mp4");
+  int left = 1;
+  for (bool failed = true; failed; ++left) {
+    use(Side::kTogether);
+    ASSERT_EQ(TAVODBExecute(MediaDBConnGet(), "BEGIN", nullptr), 0);
+    EXPECT_EQ(TAVOMediaIndexAdd(&earlier, MEDIA_TABLE_VIDEO), 0);
+    failed = false;
+    int until_failure = left;
+    platform_calls().before_statement = [&](std::string_view) {
+      failed = failed || --until_failure == 0;
+      return until_failure != 0;
+    };
+    std::vector<int> results(all.size(), 77);
+    EXPECT_EQ(TAVOMediaIndexAddMany(all.data(), static_cast<unsigned>(all.size()),
+                                    MEDIA_TABLE_VIDEO, results.data()),
+              0);
+    platform_calls().before_statement = nullptr;
+    EXPECT_THAT(results, testing::Each(0));
+    EXPECT_EQ(was_logged("Nothing is saved together"), failed);
+    ASSERT_EQ(TAVODBExecute(MediaDBConnGet(), "COMMIT", nullptr), 0);
+    EXPECT_EQ(count("video"), 1 + static_cast<long>(all.size()));
+    empty_both();
+    clear_log();
+  }
+  EXPECT_GT(left, 4) << "statements of a batch";
 }
 
 TEST_F(FailingBatches, AreAddedOneByOneWhereverTheConnectionIsLost) {

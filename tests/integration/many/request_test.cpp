@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: MIT
 
 // What the requests take and give back.
+#include <tavodb.h>
+
 #include <filesystem>
 
 #include "mediidx/database.h"
@@ -57,6 +59,21 @@ TEST_F(AddingMany, NeedsRecords) {
   EXPECT_EQ(TAVOMediaIndexDirAddMany(nullptr, 2, nullptr), -1);
   EXPECT_EQ(TAVOMediaIndexAddMany_Json(Json::Value("text"), MEDIA_TABLE_VIDEO, nullptr), -1);
   EXPECT_THAT(logged_messages(), ElementsAre("Bad parameter", "Bad parameter", "Bad parameter"));
+}
+
+TEST_F(AddingMany, IsPartOfTheCallersTransaction) {
+  std::vector<Info> songs{record(shared("a.mp3")), record(shared("b.mp3"))};
+  const auto folder = folder_record(root.make_folder("volume1/media/c"));
+  auto* conn = MediaDBConnGet();
+  for (const char* end : {"ROLLBACK", "COMMIT"}) {
+    ASSERT_EQ(TAVODBExecute(conn, "BEGIN", nullptr), 0);
+    EXPECT_EQ(TAVOMediaIndexAddMany(songs.data(), 2, MEDIA_TABLE_MUSIC, nullptr), 0);
+    EXPECT_EQ(TAVOMediaIndexDirAddMany(&folder, 1, nullptr), 0);
+    EXPECT_EQ(count("track") + count("directory"), 0) << "nobody else sees them yet";
+    ASSERT_EQ(TAVODBExecute(conn, end, nullptr), 0);
+    EXPECT_EQ(count("track") + count("directory"), end == std::string("COMMIT") ? 3 : 0);
+  }
+  EXPECT_THAT(logged(), IsEmpty());
 }
 
 TEST_F(AddingMany, RefusesATypeThatIsNoFiles) {

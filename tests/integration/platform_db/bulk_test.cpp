@@ -147,5 +147,25 @@ TEST_F(Copying, TakesUpATerminatedSessionButNotWithinATransaction) {
   EXPECT_THAT(stored(), ElementsAre("1a"));
 }
 
+class ATransaction : public DbTest {};
+
+TEST_F(ATransaction, IsKnownToItsConnection) {
+  EXPECT_EQ(TAVODBInTransaction(nullptr), 0);
+  EXPECT_EQ(TAVODBInTransaction(conn.get()), 0);
+  run("BEGIN");
+  EXPECT_EQ(TAVODBInTransaction(conn.get()), 1);
+  EXPECT_EQ(TAVODBExecute(conn.get(), "nonsense", nullptr), -1);
+  EXPECT_EQ(TAVODBInTransaction(conn.get()), 1) << "it has failed, and is still to be ended";
+  run("ROLLBACK");
+  EXPECT_EQ(TAVODBInTransaction(conn.get()), 0);
+}
+
+TEST_F(ATransaction, EndsWithItsSession) {
+  run("BEGIN");
+  terminate(session());
+  EXPECT_EQ(TAVODBExecute(conn.get(), "SELECT 1", nullptr), -1);
+  EXPECT_EQ(TAVODBInTransaction(conn.get()), 0);
+}
+
 }  // namespace
 }  // namespace mediidx::test

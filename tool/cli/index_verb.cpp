@@ -72,10 +72,12 @@ int run_index(const Arguments& arguments) {
   make_known(data, folders);
   ScanSetting setting;
   setting.full_speed = arguments.has("--full-speed");
-  const auto report = run_scanner(data, database, folders, setting);
+  const auto before = watch.seconds();
+  auto report = run_scanner(data, database, folders, setting);
+  report.timings[static_cast<std::size_t>(Phase::kStart)] = before;
   print_summary(database, report, folders);
   print_next_steps(database, arguments);
-  put(scan_line(report, watch.seconds()));
+  put(report_text(report, watch.seconds(), {.timings = arguments.has("--timings")}));
   return exit_status(report);
 }
 

@@ -5,6 +5,7 @@
 #include <json/writer.h>
 
 #include <array>
+#include <cmath>
 #include <cstdio>
 #include <thread>
 
@@ -14,6 +15,7 @@
 #include "cli/verbs.h"
 #include "mediidx/index_folder.h"
 #include "scan/priority.h"
+#include "text/table.h"
 #include "text/utf8.h"
 
 namespace mediidx::tool {
@@ -30,9 +32,11 @@ constexpr Count kCounts[] = {
     {"failed", &ScanReport::failed},
 };
 
-std::string seconds_text(double seconds) {
+constexpr int kTableWidth = 80;
+
+std::string seconds_text(double seconds, int decimals) {
   std::array<char, 32> text;
-  std::snprintf(text.data(), text.size(), "%.1f", seconds);
+  std::snprintf(text.data(), text.size(), "%.*f", decimals, seconds);
   return text.data();
 }
 
@@ -66,15 +70,27 @@ ScanReport run_scanner(const DataFolder& data, Database& database,
   return Scanner(database, data, workers, setting.options, hooks).run(folders);
 }
 
+namespace {
+
 std::string scan_line(const ScanReport& report, double seconds) {
   std::string line;
   for (const auto& count : kCounts) {
     line += std::string(count.name) + " " + std::to_string(report.*count.value) + ", ";
   }
-  return line + "seconds " + seconds_text(seconds) + "\n";
+  return line + "seconds " + seconds_text(seconds, 1) + "\n";
 }
 
-std::string scan_json(const ScanReport& report, double seconds) {
+std::string timings_table(const ScanReport& report, double seconds) {
+  std::vector<TableRow> rows;
+  for (std::size_t i = 0; i < kPhases; ++i) {
+    const auto spent = report.timings[i];
+    rows.push_back({name_of(static_cast<Phase>(i)), seconds_text(spent, 3),
+                    std::to_string(std::lround(100 * spent / seconds))});
+  }
+  return format_table({{"PHASE"}, {"SECONDS", true}, {"PERCENT", true}}, rows, kTableWidth);
+}
+
+std::string scan_json(const ScanReport& report, double seconds, bool with_timings) {
   Json::Value object;
   for (const auto& count : kCounts) object[count.name] = Json::UInt64{report.*count.value};
   object["folders"] = Json::UInt64{report.folders};
@@ -82,9 +98,19 @@ std::string scan_json(const ScanReport& report, double seconds) {
   object["mass_delete_refused"] = report.is_refused;
   object["stopped"] = report.is_stopped;
   object["seconds"] = seconds;
+  for (std::size_t i = 0; with_timings && i < kPhases; ++i) {
+    object["timings"][name_of(static_cast<Phase>(i))] = report.timings[i];
+  }
   Json::StreamWriterBuilder builder;
   builder["indentation"] = "";
   return Json::writeString(builder, object) + "\n";
+}
+
+}  // namespace
+
+std::string report_text(const ScanReport& report, double seconds, ReportStyle style) {
+  if (style.json) return scan_json(report, seconds, style.timings);
+  return (style.timings ? timings_table(report, seconds) : "") + scan_line(report, seconds);
 }
 
 int exit_status(const ScanReport& report) {

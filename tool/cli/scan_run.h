@@ -22,9 +22,14 @@ struct ScanSetting {
 ScanReport run_scanner(const DataFolder& data, Database& database,
                        const std::vector<std::string>& folders, const ScanSetting& setting);
 
-/// "added 1, changed 2, … seconds 0.4", or the same as a JSON object.
-std::string scan_line(const ScanReport& report, double seconds);
-std::string scan_json(const ScanReport& report, double seconds);
+/// How a report is told.
+struct ReportStyle {
+  bool json = false;
+  bool timings = false;  ///< Where the time went, too.
+};
+
+/// "added 1, changed 2, … seconds 0.4", behind a table of the timings, or one JSON object.
+std::string report_text(const ScanReport& report, double seconds, ReportStyle style);
 
 int exit_status(const ScanReport& report);
 

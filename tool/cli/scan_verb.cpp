@@ -62,9 +62,10 @@ int run_scan(const Arguments& arguments) {
   std::vector<std::string> folders;
   for (const auto& named : arguments.operands) folders.push_back(folder_of(named));
   Database database(data);
-  const auto report = run_scanner(data, database, folders, setting);
-  put(arguments.has("--json") ? scan_json(report, watch.seconds())
-                              : scan_line(report, watch.seconds()));
+  const auto before = watch.seconds();
+  auto report = run_scanner(data, database, folders, setting);
+  report.timings[static_cast<std::size_t>(Phase::kStart)] = before;
+  put(report_text(report, watch.seconds(), {arguments.has("--json"), arguments.has("--timings")}));
   return exit_status(report);
 }
 

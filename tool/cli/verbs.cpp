@@ -77,13 +77,15 @@ constexpr const char* kScanStatuses =
     "away, 5 no database, 6 a scan is running, 130 and 143 stopped by a signal";
 constexpr Option kFullSpeed{"--full-speed", nullptr,
                             "do not leave the processor and the disks to others"};
-constexpr Option kIndexOptions[] = {kFullSpeed};
+constexpr Option kTimings{"--timings", nullptr, "tell where the time went"};
+constexpr Option kIndexOptions[] = {kFullSpeed, kTimings};
 constexpr Option kScanOptions[] = {
     {"--full", nullptr, "read the tags of unchanged files too"},
     {"--dry-run", nullptr, "only say what there is to do"},
     {"--allow-mass-delete", nullptr, "forget files that are gone, however many they are"},
     {"--accept-volumes", nullptr, "take the file systems that are mounted now as the right ones"},
     kFullSpeed,
+    kTimings,
     {"--progress", "json", "tell the progress as lines of JSON"},
     {"--json", nullptr, "print the last line as JSON"},
 };

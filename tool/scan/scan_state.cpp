@@ -4,26 +4,36 @@
 
 #include <unistd.h>
 
+#include <algorithm>
 #include <array>
 #include <chrono>
 #include <thread>
 #include <utility>
 
 #include "store/query.h"
+#include "store/row_arrays.h"
 
 namespace mediidx::tool {
 namespace {
 
-// A statement of this many rows is a few hundred kilobytes at most.
-constexpr std::size_t kRowsOfAStatement = 500;
+// A statement of this many rows is a few hundred kilobytes, as a rule.
+constexpr std::size_t kRowsOfAStatement = 2000;
 
 // Any number that nobody else takes.
 constexpr std::int64_t kScanRight = 6334281;
 
 std::string number(std::int64_t value) { return std::to_string(value); }
+/// An enumerator as it stands in the database.
 template <class Enum>
-std::string code(Enum value) {
-  return std::to_string(static_cast<int>(value));
+int code(Enum value) {
+  return static_cast<int>(value);
+}
+/// "= 4", or "IN (4, 5)".
+template <class... Enums>
+std::string is_one_of(Enums... values) {
+  std::string list;
+  ((list += (list.empty() ? "" : ", ") + number(code(values))), ...);
+  return sizeof...(values) == 1 ? "= " + list : "IN (" + list + ")";
 }
 
 /// "f" is this folder or lies below it.
@@ -31,21 +41,14 @@ std::string in_folder(const std::string& folder) {
   return "(f.path = " + literal(folder) + " OR f.path ^@ " + literal(folder + "/") + ")";
 }
 
-/// Calls `write` with the rows of a VALUES list, so many at a time.
-template <class Items, class Row, class Write>
-void in_portions(const Items& items, const Row& row, const Write& write) {
-  std::string values;
-  std::size_t count = 0;
-  for (const auto& item : items) {
-    values += (values.empty() ? "(" : ", (") + row(item) + ")";
-    if (++count % kRowsOfAStatement == 0) write(std::exchange(values, {}));
+/// Calls `write` with so many items at a time.
+template <class Item, class Write>
+void in_portions(std::span<const Item> items, const Write& write) {
+  while (!items.empty()) {
+    const auto portion = items.first(std::min(items.size(), kRowsOfAStatement));
+    write(portion);
+    items = items.subspan(portion.size());
   }
-  if (!values.empty()) write(values);
-}
-
-std::string status_values(const FileStatus& status) {
-  return number(status.size) + ", " + number(status.modified) + ", " + number(status.device) +
-         ", " + number(status.inode);
 }
 
 constexpr const char* kChangeColumns =
@@ -74,16 +77,25 @@ std::string unknown_paths(const std::string& folder) {
          in_folder(folder) + ")";
 }
 
-// Of the file "x" of the folder "f".
+/// Of the file "x" of the folder "f".
 const std::string kTracksOfSheet =
     "(SELECT count(*) FROM virtual_info_track v WHERE v.cue_sheet_path = f.path || '/' || x.name)";
-// Audio files whose rows go or are replaced.
+
+/// Changes by which rows go or are replaced.
+const std::string kTouches = "what " + is_one_of(What::kChanged, What::kAgain, What::kGone,
+                                                 What::kLeftOut, What::kGoneWith, What::kMovedAway);
+/// Of these, the ones that take files away for good.
+const std::string kRemovesFile = "what " + is_one_of(What::kGone, What::kLeftOut, What::kGoneWith);
+const std::string kLosesFolder = "what " + is_one_of(What::kGoneFolder, What::kLeftOutFolder);
+const std::string kIsAudio = "kind " + is_one_of(Kind::kMusic);
+const std::string kIsSheet = "kind " + is_one_of(Kind::kCueSheet);
+
 const std::string kTouchedAudio =
-    "(SELECT path FROM scan.change WHERE kind = 0 AND what IN (1, 2, 4, 5, 6, 9))";
+    "(SELECT path FROM scan.change WHERE " + kIsAudio + " AND " + kTouches + ")";
 // Audio files that come, change or go, under each of their names.
-const std::string kChangedAudio = "(SELECT path, folder FROM scan.change WHERE kind = 0)";
+const std::string kChangedAudio = "(SELECT path, folder FROM scan.change WHERE " + kIsAudio + ")";
 const std::string kTouchedSheets =
-    "(SELECT path FROM scan.change WHERE kind = 4 AND what IN (1, 2, 4, 5, 6, 9))";
+    "(SELECT path FROM scan.change WHERE " + kIsSheet + " AND " + kTouches + ")";
 
 }  // namespace
 
@@ -187,8 +199,61 @@ bool ScanState::holds_anything(const std::string& folder) {
 }
 
 void ScanState::reconcile(const std::string& folder) {
+  mark_poorer_sheets(folder);
+  if (agrees(folder)) return;
   mark_lost(folder);
   take_up(folder);
+}
+
+/// Whether the library holds just what is known. Each table is compared by the number of its paths
+/// and the sum of their hashes: to join them takes many times longer, and as a rule finds nothing.
+bool ScanState::agrees(const std::string& folder) {
+  struct Table {
+    const char* name;
+    const char* known;  ///< Which of the files or folders.
+    const char* rows = "true";
+  };
+  constexpr Table kTables[] = {
+      {"track", "kind = 0", "is_virtual = 'FALSE'"},
+      {"music", "kind = 0 AND NOT personal"},
+      {"photo", "kind = 1"},
+      {"video", "kind = 2"},
+      {"playlist", "kind IN (3, 4) AND NOT personal"},
+      {"personal_playlist", "kind IN (3, 4) AND personal"},
+      {"directory", "kind IS NULL AND NOT personal"},
+      {"personal_directory", "kind IS NULL AND personal"},
+  };
+  const auto sum = [](const std::string& hash, const std::string& filter) {
+    return "concat(count(*)" + filter + ", ' ', bit_xor(" + hash + ")" + filter + ")";
+  };
+  std::string known;
+  std::string held;
+  for (const auto& [name, is_known, rows] : kTables) {
+    known +=
+        (known.empty() ? "" : ", ") + sum("hash", std::string(" FILTER (WHERE ") + is_known + ")");
+    held += (held.empty() ? "" : ", ") + std::string("(SELECT ") +
+            sum("hashtextextended(path, 0)", "") + " FROM " + name + " f WHERE " + rows + " AND " +
+            in_folder(folder) + ")";
+  }
+  // Of a sheet that failed, the row stays; of a file that is to be read again, whatever there is.
+  auto answer = database_.query(
+      "SELECT (SELECT ROW(" + known +
+      ") FROM (SELECT x.kind, f.personal, hashtextextended(f.path || '/' || x.name, 0) AS hash "
+      "FROM scan.file x JOIN scan.folder f ON x.folder = f.id WHERE x.size >= 0 AND "
+      "(x.failure IS NULL OR x.kind = 4) AND " +
+      in_folder(folder) +
+      " UNION ALL SELECT NULL, f.personal, hashtextextended(f.path, 0) FROM scan.folder f "
+      "WHERE f.modified IS NOT NULL AND " +
+      in_folder(folder) + ") known) = ROW(" + held + ") AS agrees");
+  return answer.next() && answer.flag("agrees");
+}
+
+/// A sheet whose tracks are gone has its row still.
+void ScanState::mark_poorer_sheets(const std::string& folder) {
+  database_.run("UPDATE scan.file x SET size = -2 FROM scan.folder f WHERE x.folder = f.id AND " +
+                in_folder(folder) +
+                " AND x.kind = 4 AND x.size >= 0 AND x.failure IS NULL AND x.tracks > " +
+                kTracksOfSheet);
 }
 
 void ScanState::mark_lost(const std::string& folder) {
@@ -210,11 +275,6 @@ void ScanState::mark_lost(const std::string& folder) {
                   " AND NOT EXISTS (SELECT 1 FROM " + held.table +
                   " h.path = f.path || '/' || x.name)");
   }
-  // A sheet whose tracks are gone has its row still.
-  database_.run("UPDATE scan.file x SET size = -2 FROM scan.folder f WHERE x.folder = f.id AND " +
-                in_folder(folder) +
-                " AND x.kind = 4 AND x.size >= 0 AND x.failure IS NULL AND x.tracks > " +
-                kTracksOfSheet);
   constexpr Held kFolders[] = {
       {"NOT f.personal", "directory h WHERE"},
       {"f.personal", "personal_directory h WHERE"},
@@ -269,11 +329,12 @@ void ScanState::take_up(const std::string& folder) {
 
 std::map<std::string, KnownFolder> ScanState::look_up(std::span<const ListedFolder> folders) {
   std::map<std::string, KnownFolder> out;
-  std::map<int, KnownFolder*> by_id;
-  const auto path_row = [](const ListedFolder& folder) { return literal(folder.found.path); };
-  in_portions(folders, path_row, [&](const std::string& values) {
-    auto rows = database_.query("SELECT f.path, f.id, f.mounted, f.away, f.modified FROM (VALUES " +
-                                values + ") v(path) JOIN scan.folder f ON f.path = v.path");
+  in_portions(folders, [&](std::span<const ListedFolder> portion) {
+    RowArrays paths{"text"};
+    for (const auto& folder : portion) paths.add(folder.found.path);
+    const auto given = paths.unnest() + " v(path) JOIN scan.folder f ON ";
+    auto rows = database_.query("SELECT f.path, f.id, f.mounted, f.away, f.modified FROM " + given +
+                                "f.path = v.path");
     while (rows.next()) {
       auto& known = out[rows.text("path")];
       known.id = static_cast<int>(rows.number("id"));
@@ -281,30 +342,28 @@ std::map<std::string, KnownFolder> ScanState::look_up(std::span<const ListedFold
       known.away = rows.flag("away");
       if (!rows.is_null("modified")) known.modified = rows.number("modified");
     }
-    auto below = database_.query("SELECT f.path, f.parent FROM (VALUES " + values +
-                                 ") v(path) JOIN scan.folder f ON f.parent = v.path");
+    auto below = database_.query("SELECT f.path, f.parent FROM " + given + "f.parent = v.path");
     while (below.next()) out[below.text("parent")].subfolders.push_back(below.text("path"));
   });
   add_unknown(folders, out);
+  std::map<int, KnownFolder*> by_id;
   std::vector<int> ids;
   for (auto& [path, known] : out) {
     by_id[known.id] = &known;
     ids.push_back(known.id);
   }
-  in_portions(
-      ids, [](int id) { return number(id); },
-      [&](const std::string& values) {
-        auto rows = database_.query(
-            "SELECT x.folder, x.name, x.kind, x.size, x.modified, x.failure IS NOT NULL AS failed "
-            "FROM (VALUES " +
-            values + ") v(id) JOIN scan.file x ON x.folder = v.id");
-        while (rows.next()) {
-          by_id.at(static_cast<int>(rows.number("folder")))
-              ->files.push_back({rows.text("name"), static_cast<Kind>(rows.number("kind")),
-                                 rows.number("size"), rows.number("modified"),
-                                 rows.flag("failed")});
-        }
-      });
+  in_portions(std::span<const int>(ids), [&](std::span<const int> portion) {
+    RowArrays given{"integer"};
+    for (const int id : portion) given.add(id);
+    auto rows = database_.query(
+        "SELECT x.folder, x.name, x.kind, x.size, x.modified, x.failure IS NOT NULL AS failed FROM " +
+        given.unnest() + " v(id) JOIN scan.file x ON x.folder = v.id");
+    while (rows.next()) {
+      by_id.at(static_cast<int>(rows.number("folder")))
+          ->files.push_back({rows.text("name"), static_cast<Kind>(rows.number("kind")),
+                             rows.number("size"), rows.number("modified"), rows.flag("failed")});
+    }
+  });
   return out;
 }
 
@@ -315,14 +374,14 @@ void ScanState::add_unknown(std::span<const ListedFolder> folders,
     const auto known = out.find(folder.found.path);
     if (known == out.end() || known->second.id == 0) unknown.push_back(&folder);
   }
-  const auto row = [](const ListedFolder* folder) {
-    const auto& path = folder->found.path;
-    return literal(path) + ", " + literal(path.substr(0, path.rfind('/'))) + ", " +
-           (folder->coverage.personal ? "true" : "false");
-  };
-  in_portions(unknown, row, [&](const std::string& values) {
-    auto rows = database_.query("INSERT INTO scan.folder(path, parent, personal) VALUES " + values +
-                                " RETURNING id, path");
+  in_portions(std::span<const ListedFolder* const>(unknown), [&](auto portion) {
+    RowArrays given{"text", "text", "boolean"};
+    for (const auto* folder : portion) {
+      const auto& path = folder->found.path;
+      given.add(path, path.substr(0, path.rfind('/')), folder->coverage.personal);
+    }
+    auto rows = database_.query("INSERT INTO scan.folder(path, parent, personal) SELECT * FROM " +
+                                given.unnest() + " RETURNING id, path");
     while (rows.next()) out[rows.text("path")].id = static_cast<int>(rows.number("id"));
   });
 }
@@ -352,6 +411,7 @@ Step step_of(const Change& change) {
     case What::kMoved:
       break;
   }
+  if (change.is_folder) return Step::kFolders;
   if (change.kind == Kind::kCueSheet) return Step::kCueSheets;
   return change.kind == Kind::kPlaylist ? Step::kPlaylists : Step::kMedia;
 }
@@ -359,30 +419,33 @@ Step step_of(const Change& change) {
 }  // namespace
 
 void ScanState::add(std::span<const Change> changes) {
-  const auto row = [](const Change& change) {
-    const bool is_folder = change.is_folder;
-    const auto step =
-        is_folder && step_of(change) != Step::kRemovals ? Step::kFolders : step_of(change);
-    return code(step) + ", " + code(change.what) + ", " + number(change.root) + ", " +
-           (change.folder ? number(change.folder) : "NULL") + ", " + literal(change.path) + ", " +
-           (is_folder ? "NULL" : code(change.kind)) + ", " + number(change.known) + ", " +
-           status_values(change.status);
-  };
-  in_portions(changes, row, [&](const std::string& values) {
+  in_portions(changes, [&](std::span<const Change> portion) {
+    RowArrays rows{"smallint", "smallint", "integer", "integer", "text",  "smallint",
+                   "bigint",   "bigint",   "bigint",  "bigint",  "bigint"};
+    for (const auto& change : portion) {
+      const auto& status = change.status;
+      rows.add(code(step_of(change)), code(change.what), change.root,
+               change.folder != 0 ? std::optional(change.folder) : std::nullopt, change.path,
+               change.is_folder ? std::nullopt : std::optional(code(change.kind)), change.known,
+               status.size, status.modified, status.device, status.inode);
+    }
     database_.run(
         "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, "
-        "device, inode) VALUES " +
-        values);
+        "device, inode) SELECT * FROM " +
+        rows.unnest());
   });
 }
 
 void ScanState::add_files_of_lost_folders() {
   database_.run(
       "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, device, "
-      "inode) SELECT 0, 6, c.root, f.id, f.path || '/' || x.name, x.kind, "
+      "inode) SELECT " +
+      number(code(Step::kRemovals)) + ", " + number(code(What::kGoneWith)) +
+      ", c.root, f.id, f.path || '/' || x.name, x.kind, "
       "CASE WHEN x.failure IS NULL THEN x.size ELSE -1 END, x.size, x.modified, x.device, x.inode "
       "FROM scan.change c JOIN scan.folder f ON f.path = c.path OR f.path ^@ (c.path || '/') "
-      "JOIN scan.file x ON x.folder = f.id WHERE c.what IN (7, 8)");
+      "JOIN scan.file x ON x.folder = f.id WHERE c." +
+      kLosesFolder);
 }
 
 void ScanState::find_moves() {
@@ -394,24 +457,26 @@ void ScanState::find_moves() {
       "FROM scan.change went JOIN scan.file x ON x.folder = went.folder "
       "AND x.name = regexp_replace(went.path, '^.*/', '') JOIN scan.change came "
       "ON came.device = x.device AND came.inode = x.inode AND came.size = x.size "
-      "AND came.kind = x.kind WHERE went.what IN (4, 6) AND came.what = 0 AND x.size >= 0 "
-      "AND x.failure IS NULL), "
+      "AND came.kind = x.kind WHERE went.what " +
+      is_one_of(What::kGone, What::kGoneWith) + " AND came.what " + is_one_of(What::kNew) +
+      " AND x.size >= 0 AND x.failure IS NULL), "
       "chosen AS (SELECT * FROM pairs WHERE first_came = 1 AND first_went = 1), "
-      "marked AS (UPDATE scan.change c SET what = 9 FROM chosen p WHERE c.id = p.went) "
-      "UPDATE scan.change c SET what = 3, source = p.path FROM chosen p WHERE c.id = p.came");
+      "marked AS (UPDATE scan.change c SET what = " +
+      number(code(What::kMovedAway)) +
+      " FROM chosen p WHERE c.id = p.went) UPDATE scan.change c SET what = " +
+      number(code(What::kMoved)) + ", source = p.path FROM chosen p WHERE c.id = p.came");
 }
 
 ScanState::Removal ScanState::removal_of(int root, const std::string& path) {
-  auto rows = database_.query(
-      "SELECT count(*) AS removed FROM scan.change WHERE what IN (4, 5, 6) AND known <> -1 "
-      "AND kind IS NOT NULL AND root = " +
-      number(root));
+  auto rows = database_.query("SELECT count(*) AS removed FROM scan.change WHERE " + kRemovesFile +
+                              " AND known <> -1 AND kind IS NOT NULL AND root = " + number(root));
   const auto removed = rows.next() ? rows.number("removed") : 0;
   return {removed, removed > 0 ? count_files(path) : 0};
 }
 
 void ScanState::withdraw_removals(int root) {
-  database_.run("DELETE FROM scan.change WHERE what IN (4, 5, 6, 7, 8) AND root = " + number(root));
+  database_.run("DELETE FROM scan.change WHERE (" + kRemovesFile + " OR " + kLosesFolder +
+                ") AND root = " + number(root));
 }
 
 void ScanState::withdraw(int root) {
@@ -421,21 +486,25 @@ void ScanState::withdraw(int root) {
 void ScanState::find_consequences() {
   database_.run(
       "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, device, "
-      "inode) SELECT 4, 2, 0, f.id, f.path || '/' || x.name, 4, x.size, x.size, x.modified, "
+      "inode) SELECT " +
+      number(code(Step::kCueSheets)) + ", " + number(code(What::kAgain)) +
+      ", 0, f.id, f.path || '/' || x.name, x.kind, x.size, x.size, x.modified, "
       "x.device, x.inode FROM (SELECT v.cue_sheet_path AS path FROM " +
       kChangedAudio +
       " a JOIN track t ON t.path = a.path AND t.is_virtual = 'TRUE' "
       "JOIN virtual_info_track v ON v.track = t.id "
       "UNION SELECT f.path || '/' || x.name FROM " +
       kChangedAudio +
-      " a JOIN scan.folder f ON f.id = a.folder JOIN scan.file x ON x.folder = f.id "
-      "WHERE x.kind = 4 AND x.failure IS NULL) s "
+      " a JOIN scan.folder f ON f.id = a.folder JOIN scan.file x ON x.folder = f.id WHERE x." +
+      kIsSheet +
+      " AND x.failure IS NULL) s "
       "JOIN scan.folder f ON f.path = regexp_replace(s.path, '/[^/]*$', '') "
       "JOIN scan.file x ON x.folder = f.id AND x.name = regexp_replace(s.path, '^.*/', '') "
-      "WHERE x.kind = 4 AND NOT EXISTS (SELECT 1 FROM scan.change c WHERE c.path = s.path)");
-  database_.run(
-      "UPDATE scan.file x SET size = -2 FROM scan.change c WHERE c.what = 2 AND c.folder = x.folder "
-      "AND x.name = regexp_replace(c.path, '^.*/', '')");
+      "WHERE x." +
+      kIsSheet + " AND NOT EXISTS (SELECT 1 FROM scan.change c WHERE c.path = s.path)");
+  database_.run("UPDATE scan.file x SET size = -2 FROM scan.change c WHERE c.what " +
+                is_one_of(What::kAgain) +
+                " AND c.folder = x.folder AND x.name = regexp_replace(c.path, '^.*/', '')");
   database_.run(
       "INSERT INTO scan.unsettled(what, name) "
       "SELECT 0, a.album FROM " +
@@ -451,9 +520,8 @@ void ScanState::find_consequences() {
       " c JOIN virtual_info_track v ON v.cue_sheet_path = c.path JOIN track t ON t.id = v.track");
 }
 
-std::int64_t ScanState::count(Step step) {
-  auto rows =
-      database_.query("SELECT count(*) AS changes FROM scan.change WHERE step = " + code(step));
+std::int64_t ScanState::count_changes() {
+  auto rows = database_.query("SELECT count(*) AS changes FROM scan.change");
   return rows.next() ? rows.number("changes") : 0;
 }
 
@@ -482,28 +550,38 @@ std::vector<Change> ScanState::changes(const std::string& condition, int limit) 
 }
 
 std::vector<Change> ScanState::next(Step step, std::int64_t after, int limit) {
-  return changes("WHERE step = " + code(step) + " AND id > " + number(after), limit);
+  return changes("WHERE step = " + number(code(step)) + " AND id > " + number(after), limit);
 }
 
 std::vector<Change> ScanState::moves(std::int64_t after, int limit) {
-  return changes("WHERE what = 3 AND id > " + number(after), limit);
+  return changes("WHERE what " + is_one_of(What::kMoved) + " AND id > " + number(after), limit);
 }
 
 // -- What was done -------------------------------------------------------------------------------
 
 void ScanState::save(std::span<const FileState> files) {
-  const auto row = [](const FileState& file) {
-    return number(file.folder) + ", " + literal(file.name) + ", " + code(file.kind) + ", " +
-           status_values(file.status) + ", " +
-           (file.failure.empty() ? "NULL::text" : literal(file.failure));
-  };
-  in_portions(files, row, [&](const std::string& values) {
+  in_portions(files, [&](std::span<const FileState> portion) {
+    RowArrays rows{"integer", "text", "smallint", "bigint", "bigint", "bigint", "bigint", "text"};
+    for (const auto& [folder, name, kind, status, failure] : portion) {
+      rows.add(folder, name, code(kind), status.size, status.modified, status.device, status.inode,
+               failure.empty() ? std::nullopt : std::optional(failure));
+    }
     database_.run(
-        "INSERT INTO scan.file(folder, name, kind, size, modified, device, inode, failure) VALUES " +
-        values +
+        "INSERT INTO scan.file(folder, name, kind, size, modified, device, inode, failure) "
+        "SELECT * FROM " +
+        rows.unnest() +
         " ON CONFLICT (folder, name) DO UPDATE SET kind = excluded.kind, size = excluded.size, "
         "modified = excluded.modified, device = excluded.device, inode = excluded.inode, "
         "failure = excluded.failure, tracks = NULL");
+  });
+}
+
+void ScanState::save_folders(std::span<const FolderState> folders) {
+  in_portions(folders, [&](std::span<const FolderState> portion) {
+    RowArrays rows{"integer", "bigint"};
+    for (const auto& [id, modified] : portion) rows.add(id, modified);
+    database_.run("UPDATE scan.folder SET modified = v.modified FROM " + rows.unnest() +
+                  " v(id, modified) WHERE folder.id = v.id");
   });
 }
 
@@ -578,7 +656,10 @@ namespace {
 /// Files in the index, by their paths, as changes to be made again.
 std::string plan_again(const std::string& paths) {
   return "INSERT INTO scan.change(step, what, root, folder, path, kind, known, size, modified, "
-         "device, inode) SELECT CASE x.kind WHEN 4 THEN 4 ELSE 2 END, 2, 0, f.id, p.path, x.kind, "
+         "device, inode) SELECT CASE WHEN x." +
+         kIsSheet + " THEN " + number(code(Step::kCueSheets)) + " ELSE " +
+         number(code(Step::kMedia)) + " END, " + number(code(What::kAgain)) +
+         ", 0, f.id, p.path, x.kind, "
          "x.size, x.size, x.modified, x.device, x.inode FROM (" +
          paths +
          ") p "

@@ -89,6 +89,12 @@ struct FileState {
   std::string failure;
 };
 
+/// A folder as it is now in the index.
+struct FolderState {
+  int id;
+  std::int64_t modified;
+};
+
 /// The scan cannot go on with this connection: what it had planned is lost, or may be.
 struct DatabaseLost : NoDatabase {
   using NoDatabase::NoDatabase;
@@ -145,7 +151,7 @@ class ScanState {
   void withdraw(int root);
   /// Adds the unchanged cue sheets whose audio changes, and notes what deletes may leave behind.
   void find_consequences();
-  std::int64_t count(Step step);
+  std::int64_t count_changes();
   /// The next changes of a step behind the one with this id.
   std::vector<Change> next(Step step, std::int64_t after, int limit);
   std::vector<Change> moves(std::int64_t after, int limit);
@@ -153,6 +159,7 @@ class ScanState {
   /* What was done */
 
   void save(std::span<const FileState> files);
+  void save_folders(std::span<const FolderState> folders);
   void forget_file(int folder, const std::string& name);
   void forget_path(const std::string& path);
   void forget_folder(const std::string& path);
@@ -177,6 +184,8 @@ class ScanState {
 
  private:
   void add_unknown(std::span<const ListedFolder> folders, std::map<std::string, KnownFolder>& out);
+  bool agrees(const std::string& folder);
+  void mark_poorer_sheets(const std::string& folder);
   void mark_lost(const std::string& folder);
   void take_up(const std::string& folder);
   void take_right(bool wait);

@@ -33,8 +33,10 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr int kPage = 500;
-constexpr std::size_t kBatch = 100;
-constexpr std::size_t kInFlight = 128;
+// Of the order of a megabyte as it is handed over, and more saves little.
+constexpr std::size_t kBatch = 250;
+// The workers go on while a batch is written.
+constexpr std::size_t kInFlight = 2 * kBatch;
 constexpr auto kPatience = std::chrono::seconds(60);
 constexpr auto kBetweenTries = std::chrono::milliseconds(500);
 // The kernel's clock of files ticks every few milliseconds: a file written twice within a tick, and
@@ -96,14 +98,8 @@ std::unique_ptr<DIR_INFO_REC> folder_record(const std::string& path, std::int64_
   return record;
 }
 
-bool add(const MediaFile& file) {
-  const auto json = to_json(file);
-  const auto table = table_of(file.kind);
-  // Only the JSON request takes replay gain.
-  if (file.gain.track_gain) return TAVOMediaIndexAdd_Json(json, table) == 0;
-  const auto record = std::make_unique<__tag_TAVO_MEDIA_INFO>();
-  return MediaInfoJson2Object(json, record.get()) == 0 &&
-         TAVOMediaIndexAdd(record.get(), table) == 0;
+auto one_by_one(const std::function<bool(const Change&)>& take) {
+  return [take](std::span<const Change> changes) { return std::ranges::all_of(changes, take); };
 }
 
 }  // namespace
@@ -127,11 +123,11 @@ void Scanner::check_configuration() {
 }
 
 ScanReport Scanner::run(const std::vector<std::string>& folders) {
-  for (;;) {
+  for (bool is_done = false; !is_done && !report_.is_stopped;) {
     try {
       run_once(folders);
-      report_.skipped += report_.unstorable;
-      return report_;
+      is_done = true;
+      continue;
     } catch (const AlreadyRunning&) {
       throw;
     } catch (const DatabaseLost&) {
@@ -140,8 +136,10 @@ ScanReport Scanner::run(const std::vector<std::string>& folders) {
       if (options_.dry_run || state_.is_same_connection()) throw;
     }
     wait_for_database();
-    if (report_.is_stopped) return report_;
   }
+  report_.skipped += report_.unstorable;
+  report_.timings = timings_.seconds();
+  return report_;
 }
 
 void Scanner::wait_for_database() {
@@ -173,7 +171,10 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
 
   if (options_.dry_run) database_.run("BEGIN");
   state_.begin(options_.wait);
-  plan(starts_for(folders));
+  {
+    const Timings::Part part(timings_, Phase::kPlan);
+    plan(starts_for(folders));
+  }
   if (options_.dry_run) {
     count_plan();
     database_.run("ROLLBACK");
@@ -181,7 +182,10 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
     return;
   }
   if (!stops()) apply();
-  if (!stops()) settle();
+  if (!stops()) {
+    const Timings::Part part(timings_, Phase::kSettle);
+    settle();
+  }
   if (!stops()) state_.count_tracks();
   state_.end();
 }
@@ -189,22 +193,24 @@ void Scanner::run_once(const std::vector<std::string>& folders) {
 // -- Doing ---------------------------------------------------------------------------------------
 
 void Scanner::apply() {
-  std::size_t total = 0;
-  for (const auto step :
-       {Step::kRemovals, Step::kFolders, Step::kMedia, Step::kPlaylists, Step::kCueSheets}) {
-    total += static_cast<std::size_t>(state_.count(step));
-  }
+  const auto total = static_cast<std::size_t>(state_.count_changes());
   hooks_.start(total);
-  apply_step(
-      Step::kRemovals, [this](const Change& change) { return remove(change); },
-      [this](const Change& change) {
-        const bool is_counted = !change.is_folder && change.what != What::kMovedAway;
-        if (is_counted && change.known != -1) ++report_.removed;
-      });
-  move_attributes();
-  apply_step(
-      Step::kFolders, [this](const Change& change) { return save_folder(change); },
-      [this](const Change&) { ++report_.folders; });
+  if (total == 0) return;
+  {
+    const Timings::Part part(timings_, Phase::kRemovals);
+    apply_step(Step::kRemovals, one_by_one([this](const Change& change) { return remove(change); }),
+               [this](const Change& change) {
+                 const bool is_counted = !change.is_folder && change.what != What::kMovedAway;
+                 if (is_counted && change.known != -1) ++report_.removed;
+               });
+    move_attributes();
+  }
+  {
+    const Timings::Part part(timings_, Phase::kFolders);
+    apply_step(
+        Step::kFolders, [this](std::span<const Change> changes) { return save_folders(changes); },
+        [this](const Change&) { ++report_.folders; });
+  }
   for (const auto step : {Step::kMedia, Step::kPlaylists, Step::kCueSheets}) save_files(step);
 }
 
@@ -222,7 +228,7 @@ void Scanner::check_connection() {
   if (!state_.is_same_connection()) throw DatabaseLost("the connection to the database was lost");
 }
 
-void Scanner::apply_step(Step step, const std::function<bool(const Change&)>& take,
+void Scanner::apply_step(Step step, const Take& take,
                          const std::function<void(const Change&)>& count) {
   std::int64_t after = 0;
   for (;;) {
@@ -232,7 +238,7 @@ void Scanner::apply_step(Step step, const std::function<bool(const Change&)>& ta
     bool is_done = false;
     try {
       database_.run("BEGIN");
-      is_done = std::ranges::all_of(page, take);
+      is_done = take(page);
       if (is_done) database_.run("COMMIT");
     } catch (const std::runtime_error&) {
       is_done = false;
@@ -240,7 +246,7 @@ void Scanner::apply_step(Step step, const std::function<bool(const Change&)>& ta
     if (!is_done) roll_back();
     for (const auto& change : page) {
       hooks_.step(change.path);
-      if (is_done || take(change)) {
+      if (is_done || take({&change, 1})) {
         count(change);
       } else {
         fail_in_database(change);
@@ -301,13 +307,21 @@ void Scanner::move_attributes() {
   }
 }
 
-bool Scanner::save_folder(const Change& change) {
-  std::int64_t modified = 0;
-  const auto record = folder_record(change.path, modified);
-  if (look_at(change.path) == Presence::kGone) return true;
-  if (TAVOMediaIndexDirAdd(record.get()) != 0) return false;
-  database_.run("UPDATE scan.folder SET modified = " + std::to_string(modified) +
-                " WHERE id = " + std::to_string(change.folder));
+bool Scanner::save_folders(std::span<const Change> changes) {
+  std::vector<DIR_INFO_REC> records;
+  std::vector<FolderState> states;
+  for (const auto& change : changes) {
+    FolderState state{change.folder, 0};
+    const auto record = folder_record(change.path, state.modified);
+    if (look_at(change.path) == Presence::kGone) continue;
+    records.push_back(*record);
+    states.push_back(state);
+  }
+  if (TAVOMediaIndexDirAddMany(records.data(), static_cast<unsigned>(records.size()), nullptr) !=
+      0) {
+    return false;
+  }
+  state_.save_folders(states);
   return true;
 }
 
@@ -317,11 +331,13 @@ void Scanner::save_files(Step step) {
   bool has_more = true;
   while (!stops()) {
     if (queue.empty() && has_more) {
+      const Timings::Part part(timings_, Phase::kPlan);
       auto page = state_.next(step, after, kPage);
       has_more = !page.empty();
       if (has_more) after = page.back().id;
       std::ranges::move(page, std::back_inserter(queue));
     }
+    const Timings::Part part(timings_, Phase::kTags);
     while (!queue.empty() && in_hand_.size() < kInFlight && batch_.size() < kBatch) {
       submit(std::move(queue.front()));
       queue.pop_front();
@@ -367,34 +383,53 @@ void Scanner::receive(Ready ready) {
 }
 
 void Scanner::write_batch() {
-  if (batch_.empty()) return;
+  // As planned, not as the workers came to it.
+  std::ranges::sort(batch_, {}, [](const Ready& ready) { return ready.change.id; });
+  write(batch_);
+  batch_.clear();
+}
+
+/// Together; where that fails by halves, until the bad one is alone.
+void Scanner::write(std::span<const Ready> files) {
+  if (files.empty()) return;
+  if (write_together(files)) {
+    for (const auto& ready : files) count_saved(ready);
+    return;
+  }
+  if (files.size() == 1) return write_alone(files.front());
+  const auto half = files.size() / 2;
+  write(files.first(half));
+  write(files.subspan(half));
+}
+
+bool Scanner::write_together(std::span<const Ready> files) {
+  const Timings::Part part(timings_, Phase::kLibrary);
   bool is_done = false;
   try {
     database_.run("BEGIN");
-    is_done = std::ranges::all_of(batch_, [this](const Ready& ready) { return save(ready); });
+    // The library may have gone on over a new connection, without the transaction.
+    is_done = save(files) && state_.is_same_connection();
     if (is_done) {
+      const Timings::Part noting(timings_, Phase::kNote);
       std::vector<FileState> states;
-      for (const auto& ready : batch_) states.push_back(state_of(ready));
+      for (const auto& ready : files) states.push_back(state_of(ready));
       state_.save(states);
+      const Timings::Part committing(timings_, Phase::kCommit);
       database_.run("COMMIT");
     }
   } catch (const std::runtime_error&) {
     is_done = false;
   }
-  if (is_done) {
-    for (const auto& ready : batch_) count_saved(ready);
-  } else {
-    roll_back();
-    for (const auto& ready : batch_) write_alone(ready);
-  }
-  batch_.clear();
+  if (!is_done) roll_back();
+  return is_done;
 }
 
 /// Without a transaction, as the library means its requests: a statement that fails costs itself.
 void Scanner::write_alone(const Ready& ready) {
+  const Timings::Part part(timings_, Phase::kLibrary);
   const auto& change = ready.change;
   if (change.folder != 0) state_.mark_unsure(change.folder, name_of(change.path));
-  const bool is_saved = save(ready);
+  const bool is_saved = save({&ready, 1});
   auto state = state_of(ready);
   if (is_saved) {
     count_saved(ready);
@@ -407,17 +442,26 @@ void Scanner::write_alone(const Ready& ready) {
   state_.save({&state, 1});
 }
 
-bool Scanner::save(const Ready& ready) {
-  const auto& change = ready.change;
-  const bool is_read = ready.answer.outcome == TagAnswer::Outcome::kRead;
-  if (!(is_read ? request(ready) : drop(ready))) return false;
-  if (change.what == What::kMoved) state_.forget_path(change.source);
-  return true;
+bool Scanner::save(std::span<const Ready> files) {
+  std::map<MEDIA_TABLE_TYPE, Json::Value> added;
+  for (const auto& ready : files) {
+    const auto& change = ready.change;
+    const bool is_read = ready.answer.outcome == TagAnswer::Outcome::kRead;
+    if (is_read && change.what != What::kMoved) {
+      added[table_of(change.kind)].append(to_json(ready.answer.file));
+      continue;
+    }
+    if (!(is_read ? move(ready) : drop(ready))) return false;
+    if (change.what == What::kMoved) state_.forget_path(change.source);
+  }
+  return std::ranges::all_of(added, [](const auto& files_of_table) {
+    const auto& [table, array] = files_of_table;
+    return TAVOMediaIndexAddMany_Json(array, table, nullptr) == 0;
+  });
 }
 
-bool Scanner::request(const Ready& ready) {
+bool Scanner::move(const Ready& ready) {
   const auto& change = ready.change;
-  if (change.what != What::kMoved) return add(ready.answer.file);
   // It reports a failure in any case; the rows tell.
   TAVOMediaIndexRename_Json(to_json(ready.answer.file), table_of(change.kind),
                             change.source.c_str());
@@ -551,12 +595,10 @@ bool Scanner::can_be_read_again() {
 
 void Scanner::remove_before_saving() {
   for (const auto step : {Step::kMedia, Step::kCueSheets}) {
-    apply_step(
-        step,
-        [](const Change& change) {
-          return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;
-        },
-        [](const Change&) {});
+    apply_step(step, one_by_one([](const Change& change) {
+                 return MediaInfoDBDelete(table_of(change.kind), change.path.c_str()) == 0;
+               }),
+               [](const Change&) {});
   }
 }
 

@@ -16,12 +16,14 @@
 #include <functional>
 #include <map>
 #include <set>
+#include <span>
 #include <string>
 #include <vector>
 
 #include "scan/compare.h"
 #include "scan/file_walk.h"
 #include "scan/scan_state.h"
+#include "scan/timings.h"
 #include "store/data_folder.h"
 #include "store/database.h"
 #include "workers/tag_workers.h"
@@ -57,6 +59,7 @@ struct ScanReport {
   std::vector<std::string> away_roots;  ///< Those that were not.
   bool is_refused = false;              ///< A mass removal was.
   bool is_stopped = false;
+  Timings::Seconds timings{};
 };
 
 /// The outside world's side of a scan.
@@ -120,21 +123,24 @@ class Scanner {
     TagAnswer answer;
   };
   void apply();
-  /// Calls `take` for every change of a step, in transactions; where one fails, each on its own.
-  void apply_step(Step step, const std::function<bool(const Change&)>& take,
-                  const std::function<void(const Change&)>& count);
+  using Take = std::function<bool(std::span<const Change>)>;
+  /// Calls `take` for the changes of a step, many in a transaction; where it fails, for each on its
+  /// own.
+  void apply_step(Step step, const Take& take, const std::function<void(const Change&)>& count);
   void roll_back();
   void check_connection();
   void move_attributes();
   bool remove(const Change& change);
-  bool save_folder(const Change& change);
+  bool save_folders(std::span<const Change> changes);
   void save_files(Step step);
   void submit(Change change);
   void receive(Ready ready);
   void write_batch();
+  void write(std::span<const Ready> files);
+  bool write_together(std::span<const Ready> files);
   void write_alone(const Ready& ready);
-  bool save(const Ready& ready);
-  bool request(const Ready& ready);
+  bool save(std::span<const Ready> files);
+  bool move(const Ready& ready);
   bool drop(const Ready& ready);
   FileState state_of(const Ready& ready) const;
   bool is_in_index(const Change& change);
@@ -151,6 +157,7 @@ class Scanner {
   ScanOptions options_;
   ScanHooks hooks_;
   ScanState state_;
+  Timings timings_;
   ScanReport report_;
   std::map<std::string, Root> roots_;        ///< Of this scan, by path.
   std::vector<std::string> away_;            ///< Folders whose file systems are not mounted.

@@ -81,6 +81,7 @@ void Scanner::plan(const std::vector<Start>& starts) {
       state_.set_root(root.known.id, volume_id(path), false);
     }
   }
+  if (state_.count_changes() == 0) return;
   state_.add_files_of_lost_folders();
   state_.find_moves();
   for (const auto& [path, root] : roots_) {
@@ -122,7 +123,10 @@ void Scanner::give_up(Root& root) {
 }
 
 void Scanner::plan_start(Root& root, const Start& start) {
-  if (!options_.trust_index) state_.reconcile(start.folder);
+  if (!options_.trust_index) {
+    const Timings::Part part(timings_, Phase::kKnown);
+    state_.reconcile(start.folder);
+  }
   if (look_at(start.folder) == Presence::kGone) return plan_missing(root, start.folder);
 
   std::vector<ListedFolder> portion;
@@ -158,7 +162,10 @@ void Scanner::plan_start(Root& root, const Start& start) {
   walk.exclude(data_.path());
   if (options_.before) walk.before_each(options_.before);
   if (options_.descend) walk.descend_where(options_.descend);
-  walk.walk(root.path, start.folder);
+  {
+    const Timings::Part part(timings_, Phase::kLook);
+    walk.walk(root.path, start.folder);
+  }
   flush();
 }
 
@@ -201,11 +208,15 @@ bool Scanner::is_unmounted(const ListedFolder& listed, const KnownFolder& known)
 }
 
 void Scanner::plan_folders(const Root& root, std::vector<ListedFolder>& folders) {
+  const Timings::Part part(timings_, Phase::kPlan);
   std::erase_if(folders, [this](const auto& listed) {
     return std::ranges::any_of(
         away_, [&listed](const auto& away) { return is_below(listed.found.path, away); });
   });
-  auto known = state_.look_up(folders);
+  auto known = [&] {
+    const Timings::Part looking_up(timings_, Phase::kKnown);
+    return state_.look_up(folders);
+  }();
   CompareOptions options;
   options.full = options_.full;
   options.tolerance = time_tolerance(root.path);
@@ -231,7 +242,9 @@ void Scanner::plan_folders(const Root& root, std::vector<ListedFolder>& folders)
     if (before.mounted != listed.found.is_mounted || before.away) {
       state_.set_folder(before.id, listed.found.is_mounted, false, before.modified);
     }
-    if (listed.found.is_readable) compare(listed, before, options, comparison);
+    if (!listed.found.is_readable) continue;
+    const Timings::Part comparing(timings_, Phase::kCompare);
+    compare(listed, before, options, comparison);
   }
   for (auto& change : comparison.changes) change.root = root.known.id;
   state_.add(comparison.changes);

@@ -22,11 +22,11 @@
 namespace mediidx::tool {
 namespace {
 
-/// Orders that a worker has at most: enough not to wait for its parent, few enough not to wait long
-/// behind a slow file.
-constexpr std::size_t kMostOrders = 16;
+/// Orders that a worker has at most: enough for the time in which its parent writes to the
+/// database, and no more answers than its channel holds.
+constexpr std::size_t kMostOrders = 128;
 /// It gets more once it has so few, several in one go.
-constexpr std::size_t kFewOrders = 8;
+constexpr std::size_t kFewOrders = 64;
 constexpr auto kLongestWait = std::chrono::hours(24);
 constexpr int kMostFailedStarts = 3;
 
@@ -58,7 +58,6 @@ TagWorkers::TagWorkers(unsigned count, const WorkerLimits& limits, std::string p
   for (unsigned i = 0; i < std::max(count, 1U); ++i) {
     workers_.push_back(std::make_unique<Worker>());
   }
-  start_missing();
 }
 
 TagWorkers::~TagWorkers() {
@@ -69,6 +68,7 @@ TagWorkers::~TagWorkers() {
 }
 
 void TagWorkers::submit(TagOrder order) {
+  start_missing();
   ++outstanding_;
   if (order.path.size() >= PATH_MAX) {
     answers_.push_back(

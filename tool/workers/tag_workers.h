@@ -23,8 +23,8 @@ namespace mediidx::tool {
 /// For one thread, and not to outlive it: with it go its workers.
 class TagWorkers {
  public:
-  /// Starts the workers at once. `program` is the command, of whose processes they are more; only
-  /// other programs name it. Throws std::system_error.
+  /// The workers are started when there is something to do. `program` is the command, of whose
+  /// processes they are more; only other programs name it.
   explicit TagWorkers(unsigned count, const WorkerLimits& limits = {},
                       std::string program = "/proc/self/exe");
   /// Ends them, whatever they do.
@@ -32,7 +32,8 @@ class TagWorkers {
   TagWorkers(const TagWorkers&) = delete;
   TagWorkers& operator=(const TagWorkers&) = delete;
 
-  /// Queues; never waits for a worker. The path is absolute.
+  /// Queues; never waits for a worker. The path is absolute. Throws std::system_error when a worker
+  /// that is missing cannot be started.
   void submit(TagOrder order);
   /// Submitted and not yet taken.
   std::size_t outstanding() const { return outstanding_; }

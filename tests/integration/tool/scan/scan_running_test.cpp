@@ -35,6 +35,10 @@ class ARunningScan : public ScanTest {
     for (pid_t pid = 0; in >> pid;) out.push_back(pid);
     return out;
   }
+  /// By how many transactions, or parts of them, the rows were written.
+  long transactions_of(const std::string& table) {
+    return std::stol(value("SELECT count(DISTINCT xmin::text) FROM " + table));
+  }
   /// Waits until the running scan has saved something.
   void wait_for_rows() {
     for (int i = 0; i < 6000 && count("track") == 0; ++i) {
@@ -100,6 +104,48 @@ TEST_F(ARunningScan, LetsAFailedStatementCostItsFileOnly) {
   EXPECT_EQ(done.counts, (Counts{.added = 4, .failed = 1}));
   EXPECT_THAT(done.err, HasSubstr(at("3.mp3") + ": ERROR:  new row for relation \"music\""));
   EXPECT_THAT(stored("music"), ElementsAre("0.mp3", "1.mp3", "2.mp3", "4.mp3"));
+}
+
+TEST_F(ARunningScan, SavesManyFilesAndFoldersTogether) {
+  choose();
+  fill(200);
+  for (int i = 0; i < 50; ++i) fs::create_directory(at(std::to_string(i)));
+  EXPECT_EQ(scan().counts, Counts{.added = 200});
+  for (const char* table : {"track", "music", "directory"}) {
+    EXPECT_LE(transactions_of(table), 2) << table << ", with what was there before";
+  }
+  EXPECT_EQ(count("track", "xmin::text IN (SELECT xmin::text FROM scan.file)"), 0)
+      << "one by one they would be in the scan's own transaction";
+}
+
+TEST_F(ARunningScan, SavesTheOthersOfABadFileTogetherAllTheSame) {
+  choose();
+  fill(200);
+  rows("ALTER TABLE music ADD CHECK (path NOT LIKE '%/77.mp3')");
+  EXPECT_EQ(scan().counts, (Counts{.added = 199, .failed = 1}));
+  EXPECT_LE(transactions_of("music"), 10);
+}
+
+TEST_F(ARunningScan, TellsWhereTheTimeWent) {
+  choose();
+  fill(3);
+  auto done = scan({"--timings"});
+  EXPECT_EQ(done.counts, Counts{.added = 3});
+  EXPECT_THAT(done.out, AllOf(HasSubstr("PHASE"), HasSubstr("\nlibrary  ")));
+  song("another.mp3");
+  done = scan({"--timings", "--json"});
+  Json::Value report;
+  std::istringstream(done.out) >> report;
+  const auto& timings = report["timings"];
+  EXPECT_THAT(
+      timings.getMemberNames(),
+      UnorderedElementsAre("start", "look", "known", "compare", "plan", "removals", "folders",
+                           "tags", "library", "note", "commit", "settle", "other"));
+  double sum = 0;
+  for (const auto& seconds : timings) sum += seconds.asDouble();
+  EXPECT_LE(sum, report["seconds"].asDouble()) << "every moment counts once";
+  EXPECT_GT(timings["library"].asDouble(), 0);
+  EXPECT_THAT(run({"scan", "--json"}).out, Not(HasSubstr("timings")));
 }
 
 TEST_F(ARunningScan, TriesAFileAgainThatTheDatabaseRefused) {

@@ -290,6 +290,13 @@ TEST(TagWorkers, AnswerManyOrdersOfSeveralWorkers) {
   EXPECT_FALSE(workers.take(kPatience));
 }
 
+TEST(TagWorkers, AreStartedWhenThereIsSomethingToDo) {
+  auto workers = start(2);
+  EXPECT_THAT(workers.pids(), testing::IsEmpty());
+  workers.submit({1, "/nowhere", Kind::kMusic});
+  EXPECT_THAT(workers.pids(), testing::SizeIs(2));
+}
+
 TEST(TagWorkers, AreReplacedWhenTheyDieWithNothingToDo) {
   auto workers = start(1);
   ASSERT_NE(workers.sandbox(), "");
@@ -482,7 +489,9 @@ TEST(AHostileWorker, ThatAnswersTwiceIsReplaced) {
 }
 
 TEST(AWorkerThatDoesNotStart, EndsTheReading) {
-  EXPECT_THROW(TagWorkers(1, {}, "/nowhere/mediidx"), std::system_error);
+  TagWorkers missing(1, {}, "/nowhere/mediidx");
+  EXPECT_THROW(missing.submit({1, sample(kSampleFlac), Kind::kMusic}), std::system_error);
+  EXPECT_EQ(missing.outstanding(), 0U);
   TagWorkers workers(2, {}, "/bin/true");
   workers.submit({1, sample(kSampleFlac), Kind::kMusic});
   EXPECT_THROW(take_all(workers), std::runtime_error);

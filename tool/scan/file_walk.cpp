@@ -54,18 +54,20 @@ bool is_in(const std::string& path, const std::string& folder) {
 
 }  // namespace
 
-/// The names in a folder, sorted.
+/// The names in a folder, sorted. Files are looked at from the open folder: to find each by its
+/// whole path would take longer than to look at it.
 struct FileWalk::Listing {
   struct Name {
     std::string text;
     unsigned char type;  ///< As readdir tells it.
   };
+  OpenFolder open;
   std::vector<Name> names;
   bool has_rules = false;
 
   /// False with errno set when they cannot be read to the end.
   bool read(const std::string& folder) {
-    const OpenFolder open(opendir(folder.c_str()));
+    open.reset(opendir(folder.c_str()));
     if (!open) return false;
     for (;;) {
       errno = 0;
@@ -203,6 +205,7 @@ bool FileWalk::enter(const std::string& path, const struct stat& status, bool th
   if (listing.has_rules) read_rules(path);
   in_linked_ = through_link;
   list(folder, listing, status);
+  listing = {};
   const auto links = std::exchange(links_, {});
   const auto subfolders = folder.subfolders;
   if (!visit_(folder)) return false;
@@ -221,13 +224,12 @@ bool FileWalk::enter(const std::string& path, const struct stat& status, bool th
 
 void FileWalk::list(FoundFolder& folder, const Listing& listing, const struct stat& own) {
   for (const auto& [name, type] : listing.names) {
-    const auto path = folder.path + "/" + name;
     const bool may_be_folder = type == DT_DIR || type == DT_LNK || type == DT_UNKNOWN;
-    if (!may_be_folder && (type != DT_REG || !kind_of(path))) continue;
+    if (!may_be_folder && (type != DT_REG || !kind_of(name))) continue;
     struct stat status{};
-    if (lstat(path.c_str(), &status) != 0) {
+    if (fstatat(dirfd(listing.open.get()), name.c_str(), &status, AT_SYMLINK_NOFOLLOW) != 0) {
       if (errno == ENOENT) continue;
-      skip_({path, std::strerror(errno), false});
+      skip_({folder.path + "/" + name, std::strerror(errno), false});
       folder.unreadable.push_back(name);
     } else if (S_ISLNK(status.st_mode)) {
       follow(folder, name, own);

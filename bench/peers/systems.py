@@ -22,7 +22,7 @@ import processes
 
 AUDIO = (".mp3", ".flac", ".m4a", ".ogg")
 LIMIT = 1800  # Seconds until a scan counts as hanging.
-POLL = 0.003
+POLL = 0.002
 
 
 def fresh(folder):
@@ -44,6 +44,8 @@ class FullSpeed(threading.Thread):
     it; without that it makes no difference on a machine that has nothing else to do.
     """
 
+    INTERVAL = 0.01
+
     def __init__(self, pid):
         super().__init__(daemon=True)
         self.pid = pid
@@ -51,7 +53,7 @@ class FullSpeed(threading.Thread):
 
     def run(self):
         usual = os.getpriority(os.PRIO_PROCESS, 0)
-        while os.geteuid() == 0 and not self.done.wait(POLL):
+        while os.geteuid() == 0 and not self.done.wait(self.INTERVAL):
             for process in processes.descendants(self.pid):
                 try:
                     for task in (processes.PROC / str(process) / "task").iterdir():
@@ -221,6 +223,13 @@ class MiniDlna:
     """
 
     name = "MiniDLNA"
+    ALONE = ["unshare", "--net", *([] if os.geteuid() == 0 else ["--map-root-user"])]
+
+    @classmethod
+    def may_run(cls):
+        """Not in every container."""
+        return subprocess.run([*cls.ALONE, "true"], check=False,
+                              stderr=subprocess.DEVNULL).returncode == 0
 
     def __init__(self, work, folders):
         self.work = work / "minidlna"
@@ -229,10 +238,8 @@ class MiniDlna:
 
     def start(self, option):
         self.stop()
-        unshare = ["unshare", "--net"] if os.geteuid() == 0 else ["unshare", "--map-root-user",
-                                                                  "--net"]
         watch = processes.Watch(self.cpu)
-        self.process = launch([*unshare, "minidlnad", "-S", option, "-f",
+        self.process = launch([*self.ALONE, "minidlnad", "-S", option, "-f",
                                self.work / "minidlna.conf", "-P", self.work / "pid"],
                               self.work / "output")
         self.wait_for_scan()

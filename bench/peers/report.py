@@ -114,7 +114,8 @@ def goals(results, files, loops):
     figures = Figures(results)
     first = figures.seconds("first")
     large = figures.seconds("large rescan")
-    memory = max(figures.megabytes(work, "without_server")[OURS] for work in ("first", "large first"))
+    memory = max(figures.megabytes(work, "without_server")[OURS]
+                 for work in ("first", "large first"))
     speed = first["MPD"] / first[OURS]
     part = (first["TagLib"] + first["COPY"]) / first[OURS]
     rescan = large[OURS] / large["MPD"]
@@ -142,9 +143,10 @@ def goals_of_loops(loops):
     return [
         goal("a song added by itself against its statements by hand", "2× their time",
              f"{digits(add)}×", add <= 2),
-        goal("whether a path belongs, among 10,000 folders", "5 µs", f"{digits(path)} µs", path < 5),
-        goal("a cue sheet against clearing and copying its records", "2× the time", f"{digits(cue)}×",
-             cue <= 2),
+        goal("whether a path belongs, among 10,000 folders", "5 µs", f"{digits(path)} µs",
+             path < 5),
+        goal("a cue sheet against clearing and copying its records", "2× the time",
+             f"{digits(cue)}×", cue <= 2),
     ]
 
 
@@ -182,8 +184,8 @@ def conditions(results, corpus):
     others = results.others()
     command = "./dev bench" + ("" if corpus.audio_files == 10000 else f" {corpus.audio_files}")
     text = (f"`{command}` on {datetime.date.today():%Y-%m-%d}; {machine()}. "
-            f"The {corpus.audio_files:,} audio files have {digits(corpus.bytes() / 1e6)} MB, all in "
-            "the page cache. ")
+            f"The {corpus.audio_files:,} audio files have {digits(corpus.bytes() / 1e6)} MB, all "
+            "in the page cache. ")
     if others > QUIET:
         return text + ("**The machine was not quiet: other programs took "
                        f"{others:.0%} of its processors.** Take ratios, not times, and those with "

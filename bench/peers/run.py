@@ -5,9 +5,9 @@
 
 SIZE audio files are indexed, scanned again, and again when one of them has changed; five times as
 many are scanned again. Everybody takes turns, in an order that moves on by one each round. Times
-are medians of three rounds. Memory is watched in a round of its own, for that takes time. The programs
-bench_* of the build folder are run too. With a SIZE below 1,000 there is one round, without them.
-Prints the results; REPORT gets them between two marks, and PLOT a picture of them.
+are medians of three rounds. Memory is watched in a round of its own, for that takes time. The
+programs bench_* of the build folder are run too. With a SIZE below 1,000 there is one round, without
+them. Prints the results; REPORT gets them between two marks, and PLOT a picture of them.
 """
 
 import dataclasses

@@ -40,8 +40,8 @@ def launch(words, output):
 class FullSpeed(threading.Thread):
     """MPD and MiniDLNA scan at a low priority, and have no setting against it.
 
-    While this runs, every thread of `pid` and below has the priority that we have. Only root may give
-    it; without that it makes no difference on a machine that has nothing else to do.
+    While this runs, every thread of `pid` and below has the priority that we have. Only root may
+    give it; on a machine that has nothing else to do it makes no difference.
     """
 
     INTERVAL = 0.01
@@ -123,7 +123,7 @@ class Mediidx:
 
 
 class Mpd:
-    """MPD, reached by a socket in its folder. It runs on after its first index, as it does at home."""
+    """MPD, reached by a socket in its folder. It runs on after its first index, as at home."""
 
     name = "MPD"
 

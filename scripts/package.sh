@@ -44,13 +44,14 @@ build() {
   fi
 }
 
-# The units, where the package puts them, with the programs that they start.
+# The units, with the programs that they start where the package is unpacked.
 check_units() {
   local unpacked=$here/unpacked
   rm -rf -- "$unpacked"
   dpkg-deb -x "$(ls "$here"/mediidx_"$version"_*.deb)" "$unpacked"
   say 'systemd-analyze verify'
-  systemd-analyze verify --man=no --root="$unpacked" "$unpacked"/lib/systemd/system/mediidx-*
+  sed -i "s#=/usr/bin/#=$unpacked/usr/bin/#" "$unpacked"/lib/systemd/system/*.service
+  systemd-analyze verify --man=no "$unpacked"/lib/systemd/system/mediidx-*
   for service in "$unpacked"/lib/systemd/system/*.service; do
     # 30 of 100: what is called "OK" begins at 45.
     systemd-analyze security --offline=true --threshold=30 --no-pager "$service" | tail -n 1
@@ -65,6 +66,6 @@ if [ $# -gt 0 ]; then next_version "$1"; fi
 version=$(cd -- "$tree" && dpkg-parsechangelog -S Version)
 build
 say 'lintian'
-(cd -- "$here" && lintian --fail-on error,warning --no-tag-display-limit --allow-root ./*.changes)
+(cd -- "$here" && lintian --fail-on error,warning --tag-display-limit 0 --allow-root ./*.changes)
 check_units
 say "good: $(cd -- "$here" && printf '%s ' ./*.deb)"

@@ -54,8 +54,10 @@ def picture(lines):
     return (
         f'<svg xmlns="http://www.w3.org/2000/svg" width="{width:.0f}" height="{height}" '
         f'viewBox="0 0 {width:.0f} {height}" role="img" aria-label="A scan on a terminal">\n'
+        # What the picture says of itself: REUSE-IgnoreStart
         "<!-- SPDX-FileCopyrightText: The mediidx developers\n"
         "     SPDX-License-Identifier: MIT -->\n"
+        # REUSE-IgnoreEnd
         "<style>text { font: 14px ui-monospace, 'DejaVu Sans Mono', Menlo, Consolas, monospace; "
         "fill: #d5dae5; white-space: pre } .typed { fill: #8fd18f }</style>\n"
         f'<rect width="100%" height="100%" rx="10" fill="#161a22"/>\n{texts}</svg>\n'

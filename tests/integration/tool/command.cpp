@@ -5,6 +5,7 @@
 #include <fcntl.h>
 #include <poll.h>
 #include <pty.h>
+#include <pwd.h>
 #include <signal.h>
 #include <sys/ioctl.h>
 #include <sys/stat.h>
@@ -138,6 +139,31 @@ std::string OpenFolder::write(const std::string& relative, const std::string& co
   out.close();
   if (!out) throw std::runtime_error("cannot write " + file.string());
   return file;
+}
+
+OpenCommand::OpenCommand(const std::string& user) {
+  if (geteuid() != 0) return;
+  const auto programs = fs::path(MEDIIDX_COMMAND).parent_path();
+  constexpr auto kAsTheyAre = fs::copy_options::recursive | fs::copy_options::copy_symlinks;
+  fs::copy(programs, copy_.at("bin"), kAsTheyAre);
+  fs::copy(MEDIIDX_LIBRARIES, copy_.at("lib"), kAsTheyAre);
+  const passwd* account = getpwnam(user.c_str());
+  if (!account) throw std::runtime_error("no user " + user);
+  setting_.program = copy_.at("bin") / fs::path(MEDIIDX_COMMAND).filename();
+  setting_.user = account->pw_uid;
+  group_ = account->pw_gid;
+}
+
+void OpenCommand::give(const fs::path& tree) const {
+  if (!setting_.user) return;
+  give_one(tree);
+  for (const auto& entry : fs::recursive_directory_iterator(tree)) give_one(entry.path());
+}
+
+void OpenCommand::give_one(const fs::path& path) const {
+  if (lchown(path.c_str(), *setting_.user, group_) != 0) {
+    throw std::runtime_error("cannot hand over " + path.string());
+  }
 }
 
 namespace {

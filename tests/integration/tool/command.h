@@ -56,6 +56,25 @@ class OpenFolder {
   std::filesystem::path path_;
 };
 
+/// A copy of the command where every user may run it: the build tree may stand where only root may
+/// go. Permissions do not bind root, so root has it run as another user; others run it as it is.
+class OpenCommand {
+ public:
+  /// `user`: whom root has it run as.
+  explicit OpenCommand(const std::string& user);
+  /// Runs it so.
+  const Setting& setting() const { return setting_; }
+  /// Hands over what a test made, with all that is in it.
+  void give(const std::filesystem::path& tree) const;
+
+ private:
+  void give_one(const std::filesystem::path& path) const;
+
+  OpenFolder copy_;
+  Setting setting_;
+  gid_t group_ = 0;
+};
+
 /// Processes whose command line has this word as one of its arguments; of parent and child the
 /// parent.
 std::vector<pid_t> processes_with(const std::string& argument);

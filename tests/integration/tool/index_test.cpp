@@ -4,7 +4,6 @@
 #include <gtest/gtest.h>
 #include <json/json.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <fstream>
 #include <sstream>
@@ -21,7 +20,6 @@ using testing::HasSubstr;
 using testing::Not;
 
 constexpr const char* kSong = "music/Untagged/tape side A.mp3";
-constexpr uid_t kNobody = 65534;
 
 class Indexing : public DatabaseTest {
  protected:
@@ -176,21 +174,12 @@ TEST_F(Indexing, SkipsAnUnreadableFileByName) {
   ASSERT_EQ(chmod(secret.c_str(), 0), 0);
   fs::create_directories(media.at("closed"));
   ASSERT_EQ(chmod(media.at("closed").c_str(), 0), 0);
-  Setting setting;
-  OpenFolder copy;
-  if (geteuid() == 0) {
-    // The build tree may stand where only root may go.
-    fs::create_directories(copy.at("bin"));
-    fs::copy_file(MEDIIDX_COMMAND, copy.at("bin/mediidx"));
-    fs::copy(MEDIIDX_LIBRARIES, copy.at("lib"),
-             fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    setting.program = copy.at("bin/mediidx");
-    setting.user = kNobody;
-    ASSERT_EQ(chown(data.path().c_str(), kNobody, kNobody), 0);
-    setting.environment["HOME"] = data.path();
-    // The test's server stands in a folder of its own user: nobody runs its own.
-    setting.without_server = true;
-  }
+  const OpenCommand command("nobody");
+  command.give(data.path());
+  auto setting = command.setting();
+  setting.environment["HOME"] = data.path();
+  // The test's server stands in a folder of its own user: nobody runs its own.
+  setting.without_server = true;
   const auto run = index({media.path()}, setting);
   EXPECT_EQ(run.status, 3) << run.err;
   EXPECT_THAT(run.err, HasSubstr("mediidx: not indexed: " + secret + ": Permission denied\n"));

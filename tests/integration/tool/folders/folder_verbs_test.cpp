@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: MIT
 #include <json/writer.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <fstream>
 #include <iterator>
@@ -316,23 +315,10 @@ TEST_F(FolderVerbs, AConfigurationThatCannotBeReadIsNotOverwritten) {
   output({"folder", "add", media.at("m")});
   const auto before = read_json(settings("index_folder.conf"));
   ASSERT_EQ(chmod(settings("index_folder.conf").c_str(), 0), 0);
-  Setting setting;
-  OpenFolder copy;
-  if (geteuid() == 0) {
-    constexpr uid_t kNobody = 65534;
-    // The build tree may stand where only root may go.
-    fs::create_directories(copy.at("bin"));
-    fs::copy_file(MEDIIDX_COMMAND, copy.at("bin/mediidx"));
-    fs::copy(MEDIIDX_LIBRARIES, copy.at("lib"),
-             fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    setting.program = copy.at("bin/mediidx");
-    setting.user = kNobody;
-    for (const auto& file : fs::recursive_directory_iterator(data.path())) {
-      ASSERT_EQ(lchown(file.path().c_str(), kNobody, kNobody), 0);
-    }
-  }
+  const OpenCommand command("nobody");
+  command.give(data.path());
   const auto refused =
-      run_mediidx({"--data-dir", data.at("d"), "folder", "add", media.path()}, setting);
+      run_mediidx({"--data-dir", data.at("d"), "folder", "add", media.path()}, command.setting());
   EXPECT_EQ(refused.status, 1);
   EXPECT_THAT(refused.err, HasSubstr("index_folder.conf"));
   ASSERT_EQ(chmod(settings("index_folder.conf").c_str(), 0600), 0);

@@ -183,15 +183,7 @@ TEST_F(ManyRemovals, AreNoMovesOfAsMany) {
 class UnreadableThings : public ScanTest {
  protected:
   UnreadableThings() {
-    if (geteuid() != 0) return;
-    constexpr uid_t kNobody = 65534;
-    fs::create_directories(copy.at("bin"));
-    fs::copy_file(MEDIIDX_COMMAND, copy.at("bin/mediidx"));
-    fs::copy(MEDIIDX_LIBRARIES, copy.at("lib"),
-             fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    setting.program = copy.at("bin/mediidx");
-    setting.user = kNobody;
-    EXPECT_EQ(chown(data.path().c_str(), kNobody, kNobody), 0);
+    command.give(data.path());
     setting.environment["HOME"] = data.path();
     setting.without_server = true;
   }
@@ -202,8 +194,8 @@ class UnreadableThings : public ScanTest {
     ASSERT_EQ(done.status, 0) << done.err;
   }
 
-  OpenFolder copy;
-  Setting setting;
+  OpenCommand command{"nobody"};
+  Setting setting = command.setting();
 };
 
 TEST_F(UnreadableThings, FolderFreezesWhatIsBelowIt) {

@@ -8,8 +8,6 @@
 // MEDIIDX_SCAN_SEED: one seed that is tried instead of the fresh ones.
 #include <gtest/gtest.h>
 #include <signal.h>
-#include <sys/stat.h>
-#include <unistd.h>
 
 #include <algorithm>
 #include <chrono>
@@ -31,7 +29,6 @@
 #include "index_rows.h"
 #include "integration/tool/command.h"
 #include "media_tree.h"
-#include "process.h"
 
 namespace mediidx::test {
 namespace {
@@ -46,42 +43,9 @@ constexpr int kVolumeAway = 4;
 constexpr int kNoDatabase = 5;
 constexpr int kSteps = 30;
 
-/// A copy of the command where every user may run it. Permissions do not bind root, so root has it
-/// run as the user of the database server.
-class OpenCommand {
- public:
-  OpenCommand() {
-    if (geteuid() != 0) return;
-    fs::create_directories(copy_.at("bin"));
-    fs::copy(MEDIIDX_PROGRAMS, copy_.at("bin"), fs::copy_options::recursive);
-    fs::copy(MEDIIDX_LIBRARIES, copy_.at("lib"),
-             fs::copy_options::recursive | fs::copy_options::copy_symlinks);
-    setting_.program = copy_.at("bin/mediidx");
-    account_ = tool::find_account("postgres");
-    if (account_) setting_.user = account_->uid;
-  }
-  const Setting& setting() const { return setting_; }
-  /// Hands over what a test made.
-  void give(const fs::path& tree) const {
-    if (!account_) return;
-    give_one(tree);
-    for (const auto& entry : fs::recursive_directory_iterator(tree)) give_one(entry.path());
-  }
-
- private:
-  void give_one(const fs::path& path) const {
-    if (lchown(path.c_str(), account_->uid, account_->gid) != 0) {
-      throw std::runtime_error("cannot hand over " + path.string());
-    }
-  }
-
-  OpenFolder copy_;
-  Setting setting_;
-  std::optional<tool::Account> account_;
-};
-
+/// Permissions do not bind root: as root the command runs as the user of the database server.
 const OpenCommand& open_command() {
-  static const OpenCommand command;
+  static const OpenCommand command("postgres");
   return command;
 }
 

@@ -132,6 +132,7 @@ ScanReport Scanner::run(const std::vector<std::string>& folders) {
       throw;
     } catch (const DatabaseLost&) {
       if (options_.dry_run) throw;
+      options_.trust_index = false;
     } catch (const std::runtime_error&) {
       if (options_.dry_run || state_.is_same_connection()) throw;
     }
@@ -223,7 +224,10 @@ void Scanner::roll_back() {
   check_connection();
 }
 
-/// What fails with the connection is the connection's failure, not a file's.
+/// What fails with the connection is the connection's failure, not a file's. A request may succeed
+/// all the same: the statement that finds the connection lost fails, the next one has a new one,
+/// and the transaction is gone with what it held. So nothing is noted as done before this was
+/// asked.
 void Scanner::check_connection() {
   if (!state_.is_same_connection()) throw DatabaseLost("the connection to the database was lost");
 }
@@ -239,7 +243,10 @@ void Scanner::apply_step(Step step, const Take& take,
     try {
       database_.run("BEGIN");
       is_done = take(page);
-      if (is_done) database_.run("COMMIT");
+      if (is_done) {
+        check_connection();
+        database_.run("COMMIT");
+      }
     } catch (const std::runtime_error&) {
       is_done = false;
     }
@@ -321,6 +328,7 @@ bool Scanner::save_folders(std::span<const Change> changes) {
       0) {
     return false;
   }
+  check_connection();
   state_.save_folders(states);
   return true;
 }
@@ -432,6 +440,7 @@ void Scanner::write_alone(const Ready& ready) {
   const bool is_saved = save({&ready, 1});
   auto state = state_of(ready);
   if (is_saved) {
+    check_connection();
     count_saved(ready);
   } else {
     const auto reason = fail_in_database(change);

@@ -351,6 +351,40 @@ TEST_F(ARunningScan, GoesOnWhenItsConnectionIsCut) {
   EXPECT_EQ(count("music"), 1500);
 }
 
+TEST_F(ARunningScan, ReadsAgainWhatWasInATransactionThatWasCut) {
+  constexpr int kSongs = 150;
+  const auto make_songs = [&](const SongTags& tags) {
+    for (int i = 0; i < kSongs; ++i) {
+      const auto name = std::to_string(i) + ".mp3";
+      remove(name);
+      song(name, tags);
+    }
+  };
+  make_songs({"Before", "Album", "A", ""});
+  index();
+  make_songs({"Afterwards", "Album", "B", ""});
+  int cuts = 0;
+  Setting setting;
+  setting.meanwhile = [&](pid_t pid) {
+    // A scan that stands still finds out late, as one does that waits for the readers of tags.
+    while (cuts < 5 && count("track", "title = 'Afterwards'") < kSongs) {
+      kill(pid, SIGSTOP);
+      const auto cut = rows(
+          "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity "
+          "WHERE application_name LIKE 'mediidx, process %' AND backend_xid IS NOT NULL "
+          "AND state = 'idle in transaction'");
+      cuts += static_cast<int>(cut.size());
+      kill(pid, SIGCONT);
+      usleep(10000);
+    }
+  };
+  const auto done = scan({}, setting);
+  EXPECT_EQ(done.status, 0) << done.err;
+  EXPECT_GT(cuts, 0);
+  EXPECT_EQ(count("track", "title = 'Afterwards'"), kSongs);
+  EXPECT_EQ(count("music", "title = 'Afterwards'"), kSongs);
+}
+
 TEST_F(ARunningScan, ThatWasKilledIsFinishedByTheNext) {
   fill(1500);
   choose();

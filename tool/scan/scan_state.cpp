@@ -129,11 +129,12 @@ void ScanState::begin(bool wait) {
   database_.query("SELECT set_config('application_name', " +
                   literal("mediidx, process " + std::to_string(getpid()) + " on " + host.data()) +
                   ", false)");
-  take_right(wait);
+  // First of all, so that what the server refuses is not taken for a lost connection.
   const auto now = std::chrono::steady_clock::now().time_since_epoch().count();
   token_ = std::to_string(getpid()) + "-" + std::to_string(now);
-  database_.run("DELETE FROM scan.change");
   database_.query("SELECT set_config('mediidx.scan', " + literal(token_) + ", false)");
+  take_right(wait);
+  database_.run("DELETE FROM scan.change");
 }
 
 bool ScanState::is_same_connection() {

@@ -98,7 +98,7 @@ others=()
 for package in "$@"; do
   case $package in
     postgresql-[0-9]*) servers+=("$package") ;;
-    mpd | minidlna) peers+=("$package") ;;
+    mpd | minidlna | pgbouncer) peers+=("$package") ;;
     *) others+=("$package") ;;
   esac
 done

@@ -173,8 +173,10 @@ void TestServer::fresh_database() {
   admin.run("CREATE DATABASE mediaserver TEMPLATE mediaserver_template");
 }
 
-std::vector<Row> TestServer::rows(const std::string& sql) {
-  return Connection(socket_folder(), "mediaserver").run(sql);
+std::vector<Row> TestServer::rows(const std::string& sql) { return rows_at(socket_folder(), sql); }
+
+std::vector<Row> rows_at(const fs::path& socket_folder, const std::string& sql) {
+  return Connection(socket_folder, "mediaserver").run(sql);
 }
 
 DatabaseTest::DatabaseTest() {

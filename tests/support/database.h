@@ -27,8 +27,7 @@ class TestServer {
   /// Gives an empty "mediaserver" with the schema, made anew where a test changed more than rows;
   /// sessions on it are ended.
   void fresh_database();
-  /// Runs a statement on "mediaserver" over a connection of its own. SQL null reads as "<null>".
-  /// Throws std::runtime_error with the server's message.
+  /// `rows_at` this server.
   std::vector<Row> rows(const std::string& sql);
   void stop();
   /// Ends it at once, as a loss of power does to it: sessions and what they did not commit are
@@ -42,6 +41,11 @@ class TestServer {
   struct Parts;
   Parts* parts_;
 };
+
+/// Runs a statement on "mediaserver" of the server whose socket is in this folder, over a
+/// connection of its own. SQL null reads as "<null>". Throws std::runtime_error with the server's
+/// message.
+std::vector<Row> rows_at(const std::filesystem::path& socket_folder, const std::string& sql);
 
 /// Statements that the library sent through TAVODBExecute and TAVODBSelectLimit since the last
 /// clear, failed ones included. They are also kept for the checks of every statement's plan.

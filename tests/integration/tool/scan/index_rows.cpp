@@ -4,8 +4,6 @@
 
 #include <vector>
 
-#include "database.h"
-
 namespace mediidx::test {
 namespace {
 
@@ -29,7 +27,7 @@ constexpr PathTable kPathTables[] = {{"music", "fs_online"},
                                      {"personal_playlist", "NULL::boolean"},
                                      {"personal_directory", "NULL::boolean"}};
 
-std::vector<Row> path_rows(const std::string& folder) {
+std::vector<Row> path_rows(const std::string& folder, const std::filesystem::path& server) {
   std::string sql;
   for (const auto& [name, state] : kPathTables) {
     if (!sql.empty()) sql += " UNION ALL ";
@@ -37,37 +35,39 @@ std::vector<Row> path_rows(const std::string& folder) {
            " WHERE path = " + quoted(folder) + " OR starts_with(path, " + quoted(folder + "/") +
            ")";
   }
-  return TestServer::get().rows(sql);
+  return rows_at(server, sql);
 }
 
 }  // namespace
 
-std::map<std::string, std::string> index_rows() {
+std::map<std::string, std::string> index_rows(const std::filesystem::path& server) {
   std::map<std::string, std::string> tables;
-  for (const auto& table : TestServer::get().rows(kTables)) {
+  std::string sql;
+  for (const auto& table : rows_at(server, kTables)) {
     const auto& name = table[0];
-    const auto sql =
-        table[1] == "t"
-            ? "SELECT (jsonb_build_object('of', jsonb_build_array(t.userid, t.path, t.is_virtual, "
-              "t.track)) || (to_jsonb(s) - 'track'))::text FROM " +
-                  name + " s LEFT JOIN track t ON t.id = s.track ORDER BY 1"
-            : "SELECT (to_jsonb(t) - 'id')::text FROM " + name + " t ORDER BY 1";
-    auto& lines = tables[name];
-    for (const auto& row : TestServer::get().rows(sql)) lines += row[0] + "\n";
+    tables[name] = "";
+    sql += (sql.empty() ? "SELECT '" : " UNION ALL SELECT '") + name + "', ";
+    sql += table[1] == "t"
+               ? "(jsonb_build_object('of', jsonb_build_array(t.userid, t.path, t.is_virtual, "
+                 "t.track)) || (to_jsonb(s) - 'track'))::text FROM " +
+                     name + " s LEFT JOIN track t ON t.id = s.track"
+               : "(to_jsonb(t) - 'id')::text FROM " + name + " t";
   }
+  for (const auto& row : rows_at(server, sql + " ORDER BY 1, 2")) tables[row[0]] += row[1] + "\n";
   return tables;
 }
 
-std::multiset<std::string> rows_below(const std::string& folder) {
+std::multiset<std::string> rows_below(const std::string& folder,
+                                      const std::filesystem::path& server) {
   std::multiset<std::string> rows;
-  for (const auto& row : path_rows(folder)) {
+  for (const auto& row : path_rows(folder, server)) {
     rows.insert(row[0] + " " + row[1]);
   }
   return rows;
 }
 
 bool any_online(const std::string& folder) {
-  for (const auto& row : path_rows(folder)) {
+  for (const auto& row : path_rows(folder, TestServer::get().socket_folder())) {
     if (row[2] == "t") return true;
   }
   return false;

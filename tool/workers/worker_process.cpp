@@ -14,6 +14,7 @@
 
 #include <array>
 #include <cerrno>
+#include <fstream>
 #include <initializer_list>
 #include <system_error>
 #include <thread>
@@ -72,6 +73,15 @@ class Descriptors {
 };
 
 }  // namespace
+
+bool is_runnable(pid_t pid) {
+  std::ifstream file("/proc/" + std::to_string(pid) + "/stat");
+  std::string line;
+  std::getline(file, line);
+  // "pid (name) state …", where the name may hold anything.
+  const auto name_end = line.rfind(')');
+  return name_end != line.npos && line.substr(name_end).starts_with(") R");
+}
 
 WorkerProcess::WorkerProcess(const std::string& program, const WorkerLimits& limits) {
   std::array<int, 2> ends;

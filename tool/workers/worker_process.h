@@ -18,8 +18,12 @@ namespace mediidx::tool {
 struct WorkerLimits {
   std::uint64_t memory_bytes = 1024UL * 1024 * 1024;
   std::chrono::seconds processor_time{30};  ///< For one file.
-  std::chrono::seconds time{60};            ///< For one file, by the clock.
+  std::chrono::seconds time{60};            ///< For one file, by the clock; see `is_runnable`.
 };
+
+/// Whether a process computes, or could if the machine were less busy. On a busy one, a process of
+/// the idle class may wait for minutes: that is not time which its file took.
+bool is_runnable(pid_t pid);
 
 class WorkerProcess {
  public:

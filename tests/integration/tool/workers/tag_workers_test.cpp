@@ -23,6 +23,7 @@
 #include <thread>
 
 #include "../command.h"
+#include "workers/worker_process.h"
 
 namespace mediidx::test {
 namespace {
@@ -400,6 +401,19 @@ TEST(TagWorkers, LeaveNoChildAndNoDescriptor) {
   EXPECT_EQ(open_descriptors("self").size(), before);
   EXPECT_EQ(waitpid(-1, nullptr, WNOHANG), -1);
   EXPECT_EQ(errno, ECHILD);
+}
+
+TEST(AProcess, IsRunnableWhileItComputes) {
+  EXPECT_TRUE(tool::is_runnable(getpid()));
+  const pid_t child = fork();
+  if (child == 0) {
+    pause();
+    _exit(0);
+  }
+  while (tool::is_runnable(child)) std::this_thread::sleep_for(std::chrono::milliseconds(1));
+  kill(child, SIGKILL);
+  waitpid(child, nullptr, 0);
+  EXPECT_FALSE(tool::is_runnable(child)) << "ended";
 }
 
 TEST(AWorker, HasItsChannelAndNothingElse) {

@@ -29,7 +29,7 @@ TEST_F(TheDatabase, IsMadeWhereItIsMissing) {
   drop();
   const auto run = init();
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_THAT(run.out, HasSubstr(" is ready, with version 2 of its tables.\n"));
+  EXPECT_THAT(run.out, HasSubstr(" is ready, with version 3 of its tables.\n"));
   EXPECT_EQ(rows("SELECT pg_encoding_to_char(encoding), datcollate, datctype FROM pg_database "
                  "WHERE datname = 'mediaserver'"),
             (std::vector<Row>{{"UTF8", "C", "C.UTF-8"}}));
@@ -40,7 +40,7 @@ TEST_F(TheDatabase, KeepsItsRowsWhenItIsThere) {
   rows("INSERT INTO music (path) VALUES ('/a')");
   const auto run = init();
   EXPECT_EQ(run.status, 0) << run.err;
-  EXPECT_THAT(run.out, HasSubstr(" was ready, with version 2 of its tables.\n"));
+  EXPECT_THAT(run.out, HasSubstr(" was ready, with version 3 of its tables.\n"));
   EXPECT_EQ(count("music"), 1);
 }
 

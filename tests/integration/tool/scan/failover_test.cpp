@@ -91,7 +91,7 @@ class AReplicatedIndex : public ScanTest {
     EXPECT_EQ(replicated, index_rows());
   }
 
-  static constexpr int kSongs = 250;
+  static constexpr int kSongs = 2000;
 };
 
 TEST_F(AReplicatedIndex, IsFinishedOnTheStandbyWhenThePrimaryEnds) {

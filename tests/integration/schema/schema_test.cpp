@@ -16,7 +16,8 @@ constexpr std::size_t kLongestPath = 4095;
 class Schema : public DatabaseTest {};
 
 TEST_F(Schema, RecordsItsVersion) {
-  EXPECT_THAT(rows("SELECT version FROM mediidx.schema_version"), ElementsAre(Row{"1"}, Row{"2"}, Row{"3"}));
+  EXPECT_THAT(rows("SELECT version FROM mediidx.schema_version"),
+              ElementsAre(Row{"1"}, Row{"2"}, Row{"3"}));
 }
 
 TEST_F(Schema, MayBeAppliedAgain) {

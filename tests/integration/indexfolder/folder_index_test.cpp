@@ -289,9 +289,10 @@ TEST_F(ManyFolders, AreLoadedAnew) {
 TEST_F(ManyFolders, FollowTheirShare) {
   add_share("p");
   load(text_of_folders(100));
-  root.add_share("p", "/elsewhere");
+  const auto elsewhere = root.at("elsewhere");
+  root.add_share("p", elsewhere);
   IndexFolderUpdate();
-  EXPECT_EQ(IndexFolderIsFolderIndexed("/elsewhere/99/a"), 1);
+  EXPECT_EQ(IndexFolderIsFolderIndexed((elsewhere + "/99/a").c_str()), 1);
   EXPECT_EQ(IndexFolderIsFolderIndexed(root.at("volume1/p/99/a").c_str()), -1);
 }
 

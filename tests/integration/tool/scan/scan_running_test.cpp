@@ -294,7 +294,7 @@ TEST_F(ARunningScan, IsTheOnlyOneOfItsDatabaseFromOtherDataFoldersToo) {
   Outcome second{};
   setting.meanwhile = [&](pid_t pid) {
     first = pid;
-    while (count("pg_stat_activity", "application_name LIKE 'mediidx, process %'") == 0)
+    while (count("pg_locks", "locktype = 'advisory' AND objid = 6334281 AND granted") == 0)
       usleep(1000);
     kill(pid, SIGSTOP);
     second = run_mediidx({"--data-dir", elsewhere.at("d"), "index", media.at("m")});

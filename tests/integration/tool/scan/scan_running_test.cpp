@@ -363,24 +363,33 @@ TEST_F(ARunningScan, ReadsAgainWhatWasInATransactionThatWasCut) {
   make_songs({"Before", "Album", "A", ""});
   index();
   make_songs({"Afterwards", "Album", "B", ""});
-  int cuts = 0;
+  // It is held within a batch, and stands still while its session is cut: so it finds out late, as
+  // one does that waits for the readers of tags.
+  const std::jthread holder([this] {
+    EXPECT_ANY_THROW(rows("BEGIN; LOCK TABLE track IN SHARE MODE; SELECT pg_sleep(60)"));
+  });
+  const auto wait_for_one = [this](const char* table, const char* where) {
+    while (count(table, where) == 0) usleep(1000);
+  };
+  wait_for_one("pg_locks", "relation = 'track'::regclass AND mode = 'ShareLock' AND granted");
+  std::size_t cuts = 0;
   Setting setting;
   setting.meanwhile = [&](pid_t pid) {
-    // A scan that stands still finds out late, as one does that waits for the readers of tags.
-    while (cuts < 5 && count("track", "title = 'Afterwards'") < kSongs) {
-      kill(pid, SIGSTOP);
-      const auto cut = rows(
-          "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity "
-          "WHERE application_name LIKE 'mediidx, process %' AND backend_xid IS NOT NULL "
-          "AND state = 'idle in transaction'");
-      cuts += static_cast<int>(cut.size());
-      kill(pid, SIGCONT);
-      usleep(10000);
-    }
+    wait_for_one("pg_stat_activity",
+                 "application_name LIKE 'mediidx, process %' AND wait_event_type = 'Lock'");
+    kill(pid, SIGSTOP);
+    rows("SELECT pg_cancel_backend(pid) FROM pg_stat_activity WHERE wait_event = 'PgSleep'");
+    wait_for_one("pg_stat_activity",
+                 "application_name LIKE 'mediidx, process %' AND state = 'idle in transaction'");
+    cuts = rows(
+               "SELECT pg_terminate_backend(pid, 10000) FROM pg_stat_activity "
+               "WHERE application_name LIKE 'mediidx, process %'")
+               .size();
+    kill(pid, SIGCONT);
   };
   const auto done = scan({}, setting);
   EXPECT_EQ(done.status, 0) << done.err;
-  EXPECT_GT(cuts, 0);
+  EXPECT_EQ(cuts, 1U);
   EXPECT_EQ(count("track", "title = 'Afterwards'"), kSongs);
   EXPECT_EQ(count("music", "title = 'Afterwards'"), kSongs);
 }

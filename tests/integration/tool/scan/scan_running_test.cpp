@@ -359,19 +359,21 @@ TEST_F(ARunningScan, ReadsAgainWhatWasInATransactionThatWasCut) {
       remove(name);
       song(name, tags);
     }
+    remove("film.mp4");
+    media.take_sample(kFilm, "m/film.mp4");
   };
   make_songs({"Before", "Album", "A", ""});
   index();
   make_songs({"Afterwards", "Album", "B", ""});
-  // It is held within a batch, and stands still while its session is cut: so it finds out late, as
-  // one does that waits for the readers of tags.
+  // It is held within a batch, when the songs are written and the film is next, and stands still
+  // while its session is cut: the film is saved over a new connection, the songs are gone.
   const std::jthread holder([this] {
-    EXPECT_ANY_THROW(rows("BEGIN; LOCK TABLE track IN SHARE MODE; SELECT pg_sleep(60)"));
+    EXPECT_ANY_THROW(rows("BEGIN; LOCK TABLE video IN SHARE MODE; SELECT pg_sleep(60)"));
   });
   const auto wait_for_one = [this](const char* table, const char* where) {
     while (count(table, where) == 0) usleep(1000);
   };
-  wait_for_one("pg_locks", "relation = 'track'::regclass AND mode = 'ShareLock' AND granted");
+  wait_for_one("pg_locks", "relation = 'video'::regclass AND mode = 'ShareLock' AND granted");
   std::size_t cuts = 0;
   Setting setting;
   setting.meanwhile = [&](pid_t pid) {
